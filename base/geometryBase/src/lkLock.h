@@ -19,6 +19,8 @@ public:
     LkLockGuard(const LkLockGuard&) = delete;
     LkLockGuard& operator=(const LkLockGuard&) = delete;
 
+    bool isHeld() const { return _held; }
+
 private:
     LkLockWindows& _lock;
     bool _held;

@@ -7,7 +7,8 @@ namespace Zr {
 
 class LkLockWindows {
 public:
-    explicit LkLockWindows(const char* name) : _name(name ? name : "") {}
+    explicit LkLockWindows(const char* name);
+    ~LkLockWindows();
     LkLockWindows(const LkLockWindows&) = delete;
     LkLockWindows& operator=(const LkLockWindows&) = delete;
 
@@ -19,6 +20,10 @@ public:
     bool tryLock() { return _mutex.try_lock(); }
     void unlock() { _mutex.unlock(); }
     const char* getName() const { return _name; }
+
+    // How many locks exist in the process right now: a diagnostic, so that tests can see that
+    // code making locks on demand keeps exactly the ones it means to.
+    static int getLiveCount();
 
 private:
     std::mutex _mutex;
