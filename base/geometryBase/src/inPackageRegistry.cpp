@@ -1,6 +1,5 @@
 #include "inPackageRegistry.h"
 
-#include <cstring>
 
 #include "assertions.h"
 #include "inInit.h"
