@@ -34,18 +34,6 @@ TEST(LkLockTest, GuardedWorkAndAtomicCountsLoseNoIncrement) {
     EXPECT_EQ(atomicCount.get(), threadCount * perThread);
 }
 
-TEST(LkLockTest, GuardReleasesOnEveryWayOut) {
-    LkLock lock("released lock");
-    EXPECT_STREQ(lock.getName(), "released lock");
-    try {
-        LkLockGuard guard(lock);
-        throw 1;
-    } catch (int) {
-    }
-    ASSERT_TRUE(lock.tryLock());
-    lock.unlock();
-}
-
 TEST(LkLockTest, LiveCountFollowsConstructionAndDestruction) {
     const int before = LkLockWindows::getLiveCount();
     {
