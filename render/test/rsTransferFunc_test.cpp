@@ -19,8 +19,6 @@ namespace {
 
 using Mode = SdMaterial::TransferMode;
 
-Rgba makeRgba(float r, float g, float b, float a) { return Rgba(r, g, b, a); }
-
 // A colour in double precision for the reference formulas.
 struct Ref {
     double c[3];
@@ -284,42 +282,43 @@ const std::vector<Triple>& gridColours() {
 const float gridSourceAlphas[] = {0.0f, 0.25f, 0.5f, 0.75f, 1.0f, 1.25f};
 const float gridDestinationAlphas[] = {0.0f, 0.25f, 0.5f, 0.75f, 1.0f, 1.5f};
 
-bool closeTo(double got, double expected) {
-    return std::fabs(got - expected) <= 2e-6 * std::max(1.0, std::fabs(expected));
+// Runs the mode on one pair and compares with its reference within a relative tolerance;
+// reports the first few mismatches of a mode in full and counts them all.
+bool matchesReference(const ModeCase& m, const Rgba& src, const Rgba& dst, double tolerance,
+                      int& failures) {
+    Rgba got(-9.0f, -9.0f, -9.0f, -9.0f);
+    RsTransferFunc::getFunction(m.mode)(src, dst, got);
+    const Ref want = m.reference(toRef(src), toRef(dst));
+    auto near = [tolerance](double g, double w) {
+        return std::fabs(g - w) <= tolerance * std::max(1.0, std::fabs(w));
+    };
+    if (near(got.r, want.c[0]) && near(got.g, want.c[1]) && near(got.b, want.c[2]) &&
+        near(got.a, want.a))
+        return true;
+    if (++failures <= 5) {
+        ADD_FAILURE() << m.name << " source " << describe(src) << " destination " << describe(dst)
+                      << " gave " << describe(got) << ", expected (" << want.c[0] << ", "
+                      << want.c[1] << ", " << want.c[2] << ", " << want.a << ")";
+    }
+    return false;
 }
 
 TEST(RsTransferFuncTest, EveryModeMatchesItsFormulaOverAGridOfColours) {
     for (const ModeCase& m : referenceTable()) {
-        const RsTransferFunc::Function f = RsTransferFunc::getFunction(m.mode);
-        ASSERT_NE(f, nullptr) << m.name;
-        int checked = 0;
+        ASSERT_NE(RsTransferFunc::getFunction(m.mode), nullptr) << m.name;
         int failures = 0;
         for (const Triple& sc : gridColours()) {
-            if (m.colourSpace && sc.negative) continue;
-            for (float sa : gridSourceAlphas) {
-                for (const Triple& dc : gridColours()) {
-                    if (m.colourSpace && dc.negative) continue;
+            for (const Triple& dc : gridColours()) {
+                if (m.colourSpace && (sc.negative || dc.negative)) continue;
+                for (float sa : gridSourceAlphas) {
                     for (float da : gridDestinationAlphas) {
-                        const Rgba src = makeRgba(sc.r, sc.g, sc.b, sa);
-                        const Rgba dst = makeRgba(dc.r, dc.g, dc.b, da);
-                        Rgba got = makeRgba(-9.0f, -9.0f, -9.0f, -9.0f);
-                        f(src, dst, got);
-                        const Ref want = m.reference(toRef(src), toRef(dst));
-                        const bool ok = closeTo(got.r, want.c[0]) && closeTo(got.g, want.c[1]) &&
-                                        closeTo(got.b, want.c[2]) && closeTo(got.a, want.a);
-                        ++checked;
-                        if (!ok && ++failures <= 5) {
-                            ADD_FAILURE() << m.name << " source " << describe(src)
-                                          << " destination " << describe(dst) << " gave "
-                                          << describe(got) << ", expected (" << want.c[0]
-                                          << ", " << want.c[1] << ", " << want.c[2] << ", "
-                                          << want.a << ")";
-                        }
+                        matchesReference(m, Rgba(sc.r, sc.g, sc.b, sa), Rgba(dc.r, dc.g, dc.b, da),
+                                         2e-6, failures);
                     }
                 }
             }
         }
-        EXPECT_EQ(failures, 0) << m.name << ": " << failures << " of " << checked << " differ";
+        EXPECT_EQ(failures, 0) << m.name;
     }
 }
 
@@ -334,27 +333,13 @@ TEST(RsTransferFuncTest, EveryModeMatchesItsFormulaForInexactColours) {
         return static_cast<float>(state >> 8) / 16777216.0f;
     };
     for (const ModeCase& m : referenceTable()) {
-        const RsTransferFunc::Function f = RsTransferFunc::getFunction(m.mode);
         const float low = m.colourSpace ? 0.0f : -0.5f;
         auto channel = [&]() { return low + unit() * 2.0f; };
         int failures = 0;
         for (int i = 0; i < 3000; ++i) {
-            const Rgba src = makeRgba(channel(), channel(), channel(), unit());
-            const Rgba dst = makeRgba(channel(), channel(), channel(), 0.05f + unit());
-            Rgba got;
-            f(src, dst, got);
-            const Ref want = m.reference(toRef(src), toRef(dst));
-            auto near = [](double g, double w) {
-                return std::fabs(g - w) <= 2e-5 * std::max(1.0, std::fabs(w));
-            };
-            const bool ok = near(got.r, want.c[0]) && near(got.g, want.c[1]) &&
-                            near(got.b, want.c[2]) && near(got.a, want.a);
-            if (!ok && ++failures <= 5) {
-                ADD_FAILURE() << m.name << " source " << describe(src) << " destination "
-                              << describe(dst) << " gave " << describe(got) << ", expected ("
-                              << want.c[0] << ", " << want.c[1] << ", " << want.c[2] << ", "
-                              << want.a << ")";
-            }
+            const Rgba src(channel(), channel(), channel(), unit());
+            const Rgba dst(channel(), channel(), channel(), 0.05f + unit());
+            matchesReference(m, src, dst, 2e-5, failures);
         }
         EXPECT_EQ(failures, 0) << m.name;
     }
@@ -370,8 +355,8 @@ TEST(RsTransferFuncTest, ScreenIsEvaluatedInDoublePrecision) {
     };
     int singleWouldDiffer = 0;
     for (int i = 0; i < 5000; ++i) {
-        const Rgba src = makeRgba(next(), next(), next(), next() / 1.5f);
-        const Rgba dst = makeRgba(next(), next(), next(), next() / 1.5f);
+        const Rgba src = Rgba(next(), next(), next(), next() / 1.5f);
+        const Rgba dst = Rgba(next(), next(), next(), next() / 1.5f);
         Rgba got;
         RsTransferFunc::screen(src, dst, got);
         const float channels[3][3] = {{src.r, dst.r, got.r}, {src.g, dst.g, got.g},
@@ -399,36 +384,36 @@ TEST(RsTransferFuncTest, WorkedExamples) {
         const char* why;
     };
     const Example examples[] = {
-        {Mode::normal, makeRgba(0.8f, 0.4f, 0.2f, 0.5f), makeRgba(0, 0, 0, 0),
-         makeRgba(0.4f, 0.2f, 0.1f, 0.5f), "over nothing: the premultiplied source"},
-        {Mode::add, makeRgba(1, 1, 1, 1), makeRgba(1, 1, 1, 1), makeRgba(2, 2, 2, 1),
+        {Mode::normal, Rgba(0.8f, 0.4f, 0.2f, 0.5f), Rgba(0, 0, 0, 0),
+         Rgba(0.4f, 0.2f, 0.1f, 0.5f), "over nothing: the premultiplied source"},
+        {Mode::add, Rgba(1, 1, 1, 1), Rgba(1, 1, 1, 1), Rgba(2, 2, 2, 1),
          "nothing clamps"},
-        {Mode::screen, makeRgba(1, 1, 1, 1), makeRgba(1, 1, 1, 1), makeRgba(1, 1, 1, 1),
+        {Mode::screen, Rgba(1, 1, 1, 1), Rgba(1, 1, 1, 1), Rgba(1, 1, 1, 1),
          "white on white keeps the destination"},
-        {Mode::screen, makeRgba(0.5f, 0.5f, 0.5f, 1), makeRgba(1.5f, 0.5f, 0, 1),
-         makeRgba(1.5f, 0.75f, 0.5f, 1), "a destination above 1 counts as 1 in the factor"},
-        {Mode::subtract, makeRgba(1, 1, 1, 1), makeRgba(0.3f, 0.2f, 0.1f, 0.5f),
-         makeRgba(0.3f, 0.2f, 0.1f, 1), "destination alpha 0.5: factor 0"},
-        {Mode::subtract, makeRgba(0.5f, 0.5f, 0.5f, 0.5f), makeRgba(0.75f, 0.75f, 0.75f, 1),
-         makeRgba(0.5f, 0.5f, 0.5f, 1), "destination alpha 1: plain subtraction"},
-        {Mode::subtract, makeRgba(1, 1, 1, 1), makeRgba(0.25f, 0.25f, 0.25f, 0.25f),
-         makeRgba(0.75f, 0.75f, 0.75f, 1), "destination alpha 0.25: the source adds"},
-        {Mode::luminance, makeRgba(0.5f, 0.5f, 0.5f, 1), makeRgba(0.25f, 0.5f, 0.75f, 1),
-         makeRgba(0, 0, 0, 1), "a grey source gives value 0"},
-        {Mode::luminance, makeRgba(0.5f, 0.5f, 0.5f, 0.5f), makeRgba(0.25f, 0.5f, 0.75f, 1),
-         makeRgba(0.125f, 0.25f, 0.375f, 1), "half of black plus half of the destination"},
-        {Mode::color, makeRgba(1, 0, 0, 1), makeRgba(0.5f, 0.5f, 0.5f, 1), makeRgba(0, 0, 0, 1),
+        {Mode::screen, Rgba(0.5f, 0.5f, 0.5f, 1), Rgba(1.5f, 0.5f, 0, 1),
+         Rgba(1.5f, 0.75f, 0.5f, 1), "a destination above 1 counts as 1 in the factor"},
+        {Mode::subtract, Rgba(1, 1, 1, 1), Rgba(0.3f, 0.2f, 0.1f, 0.5f),
+         Rgba(0.3f, 0.2f, 0.1f, 1), "destination alpha 0.5: factor 0"},
+        {Mode::subtract, Rgba(0.5f, 0.5f, 0.5f, 0.5f), Rgba(0.75f, 0.75f, 0.75f, 1),
+         Rgba(0.5f, 0.5f, 0.5f, 1), "destination alpha 1: plain subtraction"},
+        {Mode::subtract, Rgba(1, 1, 1, 1), Rgba(0.25f, 0.25f, 0.25f, 0.25f),
+         Rgba(0.75f, 0.75f, 0.75f, 1), "destination alpha 0.25: the source adds"},
+        {Mode::luminance, Rgba(0.5f, 0.5f, 0.5f, 1), Rgba(0.25f, 0.5f, 0.75f, 1),
+         Rgba(0, 0, 0, 1), "a grey source gives value 0"},
+        {Mode::luminance, Rgba(0.5f, 0.5f, 0.5f, 0.5f), Rgba(0.25f, 0.5f, 0.75f, 1),
+         Rgba(0.125f, 0.25f, 0.375f, 1), "half of black plus half of the destination"},
+        {Mode::color, Rgba(1, 0, 0, 1), Rgba(0.5f, 0.5f, 0.5f, 1), Rgba(0, 0, 0, 1),
          "a grey destination gives value 0"},
-        {Mode::color, makeRgba(0.5f, 0, 0, 1), makeRgba(0.25f, 0.5f, 0.25f, 0.5f),
-         makeRgba(0.75f, 0, 0, 1), "red raised to the destination's value 1, half weighted"},
-        {Mode::softlight, makeRgba(0.25f, 0.75f, 0.5f, 0.5f), makeRgba(0.3f, 0.2f, 0.1f, 0),
-         makeRgba(0.125f, 0.375f, 0.25f, 0.5f), "a transparent destination counts as black"},
-        {Mode::softlight, makeRgba(0.75f, 0.75f, 0.75f, 1), makeRgba(-0.5f, 0.25f, 1, 1),
-         makeRgba(0, 0.375f, 1, 1), "a negative channel reaches the root as 0"},
-        {Mode::hue, makeRgba(0, 0, 1, 1), makeRgba(0.5f, 0.25f, 0.25f, 0.5f),
-         makeRgba(0.25f, 0.25f, 1, 1), "blue hue at saturation 0.5 and value 1, half weighted"},
-        {Mode::saturation, makeRgba(1, 1, 1, 1), makeRgba(0.25f, 0.5f, 0.75f, 1),
-         makeRgba(0.75f, 0.75f, 0.75f, 1), "a grey source takes all saturation away"},
+        {Mode::color, Rgba(0.5f, 0, 0, 1), Rgba(0.25f, 0.5f, 0.25f, 0.5f),
+         Rgba(0.75f, 0, 0, 1), "red raised to the destination's value 1, half weighted"},
+        {Mode::softlight, Rgba(0.25f, 0.75f, 0.5f, 0.5f), Rgba(0.3f, 0.2f, 0.1f, 0),
+         Rgba(0.125f, 0.375f, 0.25f, 0.5f), "a transparent destination counts as black"},
+        {Mode::softlight, Rgba(0.75f, 0.75f, 0.75f, 1), Rgba(-0.5f, 0.25f, 1, 1),
+         Rgba(0, 0.375f, 1, 1), "a negative channel reaches the root as 0"},
+        {Mode::hue, Rgba(0, 0, 1, 1), Rgba(0.5f, 0.25f, 0.25f, 0.5f),
+         Rgba(0.25f, 0.25f, 1, 1), "blue hue at saturation 0.5 and value 1, half weighted"},
+        {Mode::saturation, Rgba(1, 1, 1, 1), Rgba(0.25f, 0.5f, 0.75f, 1),
+         Rgba(0.75f, 0.75f, 0.75f, 1), "a grey source takes all saturation away"},
     };
     for (const Example& e : examples) {
         Rgba got;
@@ -442,11 +427,11 @@ TEST(RsTransferFuncTest, WorkedExamples) {
 
 // Every function reads its inputs before it stores, so the destination may receive the result.
 TEST(RsTransferFuncTest, ResultMayBeTheDestination) {
-    for (int m = 0; m < RsTransferFunc::kModeCount; ++m) {
+    for (int m = 0; m < SdMaterial::transferModeCount; ++m) {
         if (m == static_cast<int>(Mode::dissolve)) continue;
         const RsTransferFunc::Function f = RsTransferFunc::getFunction(static_cast<Mode>(m));
-        const Rgba src = makeRgba(0.75f, 0.25f, 0.5f, 0.75f);
-        const Rgba dst = makeRgba(0.25f, 0.5f, 0.125f, 0.5f);
+        const Rgba src = Rgba(0.75f, 0.25f, 0.5f, 0.75f);
+        const Rgba dst = Rgba(0.25f, 0.5f, 0.125f, 0.5f);
         Rgba separate;
         f(src, dst, separate);
         Rgba inPlace = dst;
@@ -467,14 +452,14 @@ bool sameBits(const Rgba& x, const Rgba& y) {
 // Each result is either the source at alpha 1, unscaled, or the destination whole; never a
 // blend. The share of sources that pass follows the source's alpha.
 TEST(RsTransferFuncTest, DissolveIsAllOrNothing) {
-    const Rgba dst = makeRgba(0.1f, 0.2f, 0.3f, 0.4f);
+    const Rgba dst = Rgba(0.1f, 0.2f, 0.3f, 0.4f);
     for (float sa : {0.0f, 0.1f, 0.5f, 0.9f, 1.0f, 1.5f}) {
-        const Rgba src = makeRgba(0.7f, 1.5f, -0.25f, sa);
-        const Rgba opaqueSource = makeRgba(0.7f, 1.5f, -0.25f, 1.0f);
+        const Rgba src = Rgba(0.7f, 1.5f, -0.25f, sa);
+        const Rgba opaqueSource = Rgba(0.7f, 1.5f, -0.25f, 1.0f);
         const int draws = 20000;
         int passed = 0;
         for (int i = 0; i < draws; ++i) {
-            Rgba got = makeRgba(-9, -9, -9, -9);
+            Rgba got = Rgba(-9, -9, -9, -9);
             RsTransferFunc::dissolve(src, dst, got);
             if (sameBits(got, opaqueSource)) {
                 ++passed;
@@ -496,14 +481,14 @@ TEST(RsTransferFuncTest, DissolveIsAllOrNothing) {
 // The decision is the shared generator's next draw u against sa > u * 0.9999: a copy of the
 // generator taken before the call predicts it, and each call takes exactly one draw.
 TEST(RsTransferFuncTest, DissolveDrawsOncePerCallFromTheSharedGenerator) {
-    const Rgba dst = makeRgba(0.1f, 0.2f, 0.3f, 0.4f);
+    const Rgba dst = Rgba(0.1f, 0.2f, 0.3f, 0.4f);
     for (int i = 0; i < 5000; ++i) {
         RnNumRecUniformRng<float> twin = RsTransferFunc::_rand;
         const float u = twin.eval();
         // An alpha just above or just below the threshold, alternately.
         const float threshold = u * 0.9999f;
         const float sa = (i % 2 == 0) ? std::nextafter(threshold, 2.0f) : threshold;
-        const Rgba src = makeRgba(0.5f, 0.5f, 0.5f, sa);
+        const Rgba src = Rgba(0.5f, 0.5f, 0.5f, sa);
         Rgba got;
         RsTransferFunc::dissolve(src, dst, got);
         const bool passed = got.a == 1.0f && got.r == 0.5f;

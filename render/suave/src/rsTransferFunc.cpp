@@ -3,6 +3,7 @@
 #include <bit>
 #include <cmath>
 #include <cstdint>
+#include <iterator>
 
 #include "coHsvColor.h"
 
@@ -135,7 +136,8 @@ inline float softlightChannel(float s, float unpremultipliedD) {
 constexpr float kDissolveScale = 0.9999F;
 static_assert(std::bit_cast<std::uint32_t>(kDissolveScale) == 0x3f7ff972U);
 
-constexpr RsTransferFunc::Function kFunctions[RsTransferFunc::kModeCount] = {
+// Indexed by the mode's number, which is fixed by the scene description.
+constexpr RsTransferFunc::Function kFunctions[] = {
     &RsTransferFunc::normal,     &RsTransferFunc::lumapremul,     &RsTransferFunc::dissolve,
     &RsTransferFunc::add,        &RsTransferFunc::subtract,       &RsTransferFunc::multiply,
     &RsTransferFunc::spotlight,  &RsTransferFunc::spotlightBlend, &RsTransferFunc::screen,
@@ -144,18 +146,21 @@ constexpr RsTransferFunc::Function kFunctions[RsTransferFunc::kModeCount] = {
     &RsTransferFunc::exclusion,  &RsTransferFunc::hue,            &RsTransferFunc::saturation,
     &RsTransferFunc::color,      &RsTransferFunc::luminance,
 };
+static_assert(std::size(kFunctions) == SdMaterial::transferModeCount);
+static_assert(static_cast<int>(SdMaterial::TransferMode::screen) == 8);
+static_assert(static_cast<int>(SdMaterial::TransferMode::luminance) == 19);
 
 }  // namespace
 
 RsTransferFunc::Function RsTransferFunc::getFunction(SdMaterial::TransferMode mode) {
     const auto index = static_cast<long long>(mode);
-    if (index < 0 || index >= kModeCount) return nullptr;
+    if (index < 0 || index >= SdMaterial::transferModeCount) return nullptr;
     return kFunctions[index];
 }
 
 bool RsTransferFunc::canBeOpaque(SdMaterial::TransferMode mode) {
-    const auto index = static_cast<long long>(mode);
-    return index == 0 || index == 1 || index == 2;
+    using Mode = SdMaterial::TransferMode;
+    return mode == Mode::normal || mode == Mode::lumapremul || mode == Mode::dissolve;
 }
 
 void RsTransferFunc::normal(const Rgba& source, const Rgba& destination, Rgba& result) {

@@ -63,9 +63,6 @@ public:
     // the order of draws follows the order of calls.
     static RnNumRecUniformRng<float> _rand;
 
-    // The number of modes; the modes are the values 0 to kModeCount - 1.
-    static constexpr int kModeCount = 20;
-
     RsTransferFunc() = delete;
 };
 
