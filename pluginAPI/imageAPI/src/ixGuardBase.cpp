@@ -12,4 +12,12 @@ IxGuardBase::IxGuardBase(const RCShdPtr<IxTileStorage>& storage)
       _rowStride(storage->getRowStride()),
       _lock(makeShared<IxTileLock>(storage)) {}
 
+void IxGuardBase::dump(std::ostream& os) const {
+    os << " _pixelFormat:";
+    _pixelFormat.dump(os);
+    os << " _rectangle:";
+    _rectangle.dump(os);
+    os << " _tileHandle: " << static_cast<const void*>(_tileHandle) << " _rowStride: " << _rowStride;
+}
+
 }  // namespace Zr

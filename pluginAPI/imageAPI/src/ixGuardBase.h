@@ -6,6 +6,8 @@
 // Guards are values: copies share one hold on the pixels, which stay locked in memory until the
 // last copy goes. Nothing in a guard changes once it is taken, so its members may be read from
 // any thread.
+#include <ostream>
+
 #include "geRectangle.h"
 #include "ixPixelFormat.h"
 #include "ixTileLock.h"
@@ -19,6 +21,9 @@ public:
     bool holdsTile() const { return _tileHandle != nullptr; }
     // Bytes from one pixel to the next within a row.
     int getBytesPerPixel() const { return _pixelFormat.getBytesPerPixel(); }
+
+    // Prints the members under their names, for diagnostics.
+    void dump(std::ostream& os) const;
 
     IxPixelFormat _pixelFormat;
     GeRectangle<int> _rectangle;

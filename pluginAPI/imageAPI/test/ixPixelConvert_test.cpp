@@ -7,6 +7,7 @@
 #include <cmath>
 #include <cstdint>
 #include <limits>
+#include <utility>
 #include <vector>
 
 #include "ixPixelConvert.h"
@@ -60,21 +61,15 @@ std::uint16_t referenceFloatToHalf(float f) {
 
 float floatFromBits(std::uint32_t bits) { return std::bit_cast<float>(bits); }
 
-TEST(IxPixelConvertHalf, EveryHalfReadsAsItsValue) {
-    for (std::uint32_t h = 0; h <= 0xffff; ++h) {
-        const float f = IxPixelConvert::halfToFloat(static_cast<std::uint16_t>(h));
-        ASSERT_EQ(static_cast<double>(f), halfValue(static_cast<std::uint16_t>(h))) << std::hex << h;
-        ASSERT_EQ(std::signbit(f), (h & 0x8000) != 0) << std::hex << h;
-    }
-}
-
-TEST(IxPixelConvertHalf, FiniteHalvesSurviveTheRoundTripAndExponent31Saturates) {
+TEST(IxPixelConvertHalf, EveryHalfReadsAsItsValueAndFiniteOnesComeBack) {
     for (std::uint32_t h = 0; h <= 0xffff; ++h) {
         const auto half = static_cast<std::uint16_t>(h);
-        const std::uint16_t back = IxPixelConvert::floatToHalf(IxPixelConvert::halfToFloat(half));
+        const float f = IxPixelConvert::halfToFloat(half);
+        ASSERT_EQ(static_cast<double>(f), halfValue(half)) << std::hex << h;
+        ASSERT_EQ(std::signbit(f), (h & 0x8000) != 0) << std::hex << h;
+        // Exponent 31 read as a large float saturates on the way back.
         const bool exponent31 = ((h >> 10) & 31) == 31;
-        const std::uint16_t expected = exponent31 ? static_cast<std::uint16_t>((h & 0x8000) | 0x7bff) : half;
-        ASSERT_EQ(back, expected) << std::hex << h;
+        ASSERT_EQ(IxPixelConvert::floatToHalf(f), exponent31 ? (h & 0x8000) | 0x7bff : h) << std::hex << h;
     }
 }
 
@@ -120,11 +115,9 @@ TEST(IxPixelConvertHalf, LandmarkValues) {
     };
     const float inf = std::numeric_limits<float>::infinity();
     const Case cases[] = {
-        {0.0f, 0x0000},          {-0.0f, 0x8000},        {1.0f, 0x3c00},
-        {-2.0f, 0xc000},         {0.5f, 0x3800},         {65504.0f, 0x7bff},
-        {65536.0f, 0x7bff},      {inf, 0x7bff},          {-inf, 0xfbff},
-        {std::ldexp(1.0f, -14), 0x0400},                 {std::ldexp(1.0f, -24), 0x0001},
-        // Half-ulp of 1 is 2^-11: exactly half way rounds up in magnitude, not to even.
+        {0.0f, 0x0000},  {-0.0f, 0x8000}, {1.0f, 0x3c00},       {-2.0f, 0xc000},
+        {65504.0f, 0x7bff}, {inf, 0x7bff},  {-inf, 0xfbff},       {std::ldexp(1.0f, -24), 0x0001},
+        // 1 + 2^-11 lies half way between 1 and the next half: it rounds up, not to even.
         {1.0f + std::ldexp(1.0f, -11), 0x3c01},          {-(1.0f + std::ldexp(1.0f, -11)), 0xbc01},
         {1.0f + std::ldexp(1.0f, -11) - std::ldexp(1.0f, -23), 0x3c00},
         // No flush to zero: 2^-46 comes out as a small half rather than 0.
@@ -135,13 +128,6 @@ TEST(IxPixelConvertHalf, LandmarkValues) {
         EXPECT_EQ(IxPixelConvert::floatToHalf(c.value), referenceFloatToHalf(c.value)) << c.value;
     }
     EXPECT_EQ(IxPixelConvert::floatToHalf(std::numeric_limits<float>::quiet_NaN()), 0x7bff);
-}
-
-TEST(IxPixelConvertHalf, NoFloatEverBecomesAHalfInfinityOrNaN) {
-    for (std::uint64_t b = 0; b <= 0xffffffffull; b += 65521) {
-        const std::uint16_t h = IxPixelConvert::floatToHalf(floatFromBits(static_cast<std::uint32_t>(b)));
-        ASSERT_NE(h & 0x7c00, 0x7c00) << std::hex << b;
-    }
 }
 
 TEST(IxPixelConvertByte, ScaleConstantAndEveryByte) {
@@ -172,12 +158,10 @@ TEST(IxPixelConvertByte, FloatToByteRoundsToNearestAndClamps) {
         previous = got;
     }
     const float inf = std::numeric_limits<float>::infinity();
-    EXPECT_EQ(IxPixelConvert::floatToByte(-inf), 0);
-    EXPECT_EQ(IxPixelConvert::floatToByte(inf), 255);
-    EXPECT_EQ(IxPixelConvert::floatToByte(1e30f), 255);
-    EXPECT_EQ(IxPixelConvert::floatToByte(-1e30f), 0);
-    EXPECT_EQ(IxPixelConvert::floatToByte(std::numeric_limits<float>::quiet_NaN()), 0);
-    EXPECT_EQ(IxPixelConvert::floatToByte(0.5f), 128);  // 128.0 exactly: halves round up
+    // 0.5 gives 128.0 exactly: halves round up. NaN gives 0.
+    for (auto [v, b] : {std::pair{-inf, 0}, {inf, 255}, {1e30f, 255}, {-1e30f, 0}, {0.5f, 128},
+                        {std::numeric_limits<float>::quiet_NaN(), 0}})
+        EXPECT_EQ(IxPixelConvert::floatToByte(v), b) << v;
 }
 
 }  // namespace

@@ -1,24 +1,21 @@
 #pragma once
-// The pixel formats the image tests run through, and a way to read one pixel of a guard.
+// The pixel formats the image tests run through, and pixel access by colour.
+#include <gtest/gtest.h>
+
 #include <vector>
 
-#include "coRgbaColorTyped.h"
-#include "ixPixelFormat.h"
 #include "ixReadGuard.h"
 #include "ixRowCodec.h"
+#include "ixWriteGuard.h"
 
 namespace Zr::IxTestFormats {
 
-// The nine formats of one, three or four channels of bytes, halves and floats, plus COMPLEX.
-inline std::vector<IxPixelFormat> all(bool withComplex = true) {
+// The nine formats of one, three or four channels of bytes, halves and floats, then COMPLEX.
+inline std::vector<IxPixelFormat> all() {
     std::vector<IxPixelFormat> formats;
-    for (auto depth : {IxPixelFormat::UINT8, IxPixelFormat::FLOAT16, IxPixelFormat::FLOAT32,
-                       IxPixelFormat::COMPLEX}) {
-        if (depth == IxPixelFormat::COMPLEX && !withComplex) continue;
-        for (auto comps : {IxPixelFormat::ALPHA, IxPixelFormat::RGB, IxPixelFormat::RGBA}) {
+    for (auto depth : {IxPixelFormat::UINT8, IxPixelFormat::FLOAT16, IxPixelFormat::FLOAT32, IxPixelFormat::COMPLEX})
+        for (auto comps : {IxPixelFormat::ALPHA, IxPixelFormat::RGB, IxPixelFormat::RGBA})
             formats.emplace_back(comps, depth);
-        }
-    }
     return formats;
 }
 
@@ -28,13 +25,26 @@ inline Rgba readPixel(const IxReadGuard& guard, int x, int y) {
     return colour;
 }
 
-// The largest error a channel of this depth may add to a value of magnitude up to 1.
-inline float tolerance(IxPixelFormat::Depth depth) {
-    switch (depth) {
-    case IxPixelFormat::UINT8: return 0.5f / 255.0f + 1e-6f;
-    case IxPixelFormat::FLOAT16: return 1.0f / 2048.0f;
-    default: return 0.0f;
-    }
+inline void writePixel(const IxWriteGuard& guard, int x, int y, const Rgba& colour) {
+    IxRowCodec::selectWriter(guard._pixelFormat)(guard.getPixelAddress(x, y), &colour, 1);
+}
+
+// A colour as a format keeps it: missing alpha reads 1, missing colour reads 0.
+inline Rgba presentChannels(const Rgba& c, IxPixelFormat::Comps comps) {
+    if (comps == IxPixelFormat::ALPHA) return {0.0f, 0.0f, 0.0f, c.a};
+    if (comps == IxPixelFormat::RGB) return {c.r, c.g, c.b, 1.0f};
+    return c;
+}
+
+// Compares within the error a channel of the depth may add to a value within 0..1.
+inline void expectNear(const Rgba& got, const Rgba& want, IxPixelFormat::Depth depth) {
+    const float tolerance = depth == IxPixelFormat::UINT8    ? 0.5f / 255.0f + 1e-6f
+                            : depth == IxPixelFormat::FLOAT16 ? 1.0f / 2048.0f
+                                                              : 0.0f;
+    EXPECT_NEAR(got.r, want.r, tolerance);
+    EXPECT_NEAR(got.g, want.g, tolerance);
+    EXPECT_NEAR(got.b, want.b, tolerance);
+    EXPECT_NEAR(got.a, want.a, tolerance);
 }
 
 }  // namespace Zr::IxTestFormats
