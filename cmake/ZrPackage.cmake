@@ -35,7 +35,8 @@ function(zr_add_library target exportName)
   target_link_libraries(${target} PUBLIC ${ARG_DEPS})
   target_compile_definitions(${target} PRIVATE ZR_BUILD_TYPE="${CMAKE_BUILD_TYPE}")
   set_target_properties(${target} PROPERTIES EXPORT_NAME ${exportName}
-                        VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
+                        VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR}
+                        INSTALL_RPATH "$ORIGIN")
   install(FILES ${headers} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/ZR)
   set(ZR_EXPORTED_TARGETS ${ZR_EXPORTED_TARGETS} ${target} CACHE INTERNAL "")
 endfunction()
