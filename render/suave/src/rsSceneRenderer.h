@@ -1,0 +1,121 @@
+#pragma once
+// One render call's drawing of a scene into the pixel region of a buffer factory: the matrices of
+// the view, and the division of the region into pieces small enough for one buffer each.
+//
+// A region whose area is within the factory's getMaxArea is drawn as one; a larger one is cut into
+// four at its middle, recursively. Each quadrant is grown by the factory's kernel size towards the
+// middle, so that with a filter the quadrants overlap by twice that and each holds the fragments
+// that its filter footprint reads. One region's buffer exists at a time: it is created, every
+// instance of the list is drawn into it, it is finalised into the output and released before the
+// next region starts.
+#include <utility>
+#include <vector>
+
+#include "assertions.h"
+#include "geAffineMatrix3.h"
+#include "geProjectiveMatrix3.h"
+#include "geRectangle.h"
+#include "rcShdPtr.h"
+#include "rsCullAndSort.h"
+#include "rsGeomInstance.h"
+#include "rsRegionDrawer.h"
+#include "rsShadingContext.h"
+
+namespace Zr {
+
+template <class Factory>
+class RsSceneRenderer {
+    template <class P>
+    struct Pointee;
+    template <class T>
+    struct Pointee<RCShdPtr<T>> {
+        using type = T;
+    };
+
+public:
+    using Buffer = typename Pointee<decltype(std::declval<Factory&>().createBuffer(
+        std::declval<const GeRectangle<int>&>()))>::type;
+
+    explicit RsSceneRenderer(Factory& factory) : _factory(&factory) {}
+
+    // Takes the view of the call. The pixel matrix maps camera space onto the pixels of rectangle:
+    // the projection to -1..1 first, then x and y onto the rectangle and depth onto 0..1.
+    void setup(const GeAffineMatrix3<float>& worldToCamera, const GeProjectiveMatrix3<double>& projection,
+               const GeRectangle<int>& rectangle) {
+        _worldToCamera = worldToCamera;
+        _projection = projection;
+        _region = rectangle;
+        const float sx = static_cast<float>(rectangle.x1 - rectangle.x0) * 0.5f;
+        const float sy = static_cast<float>(rectangle.y1 - rectangle.y0) * 0.5f;
+        const float ox = static_cast<float>(rectangle.x0) + sx;
+        const float oy = static_cast<float>(rectangle.y0) + sy;
+        const GeProjectiveMatrix3<float> viewport(sx, 0.0f, 0.0f, ox,  //
+                                                  0.0f, sy, 0.0f, oy,  //
+                                                  0.0f, 0.0f, 0.5f, 0.5f,  //
+                                                  0.0f, 0.0f, 0.0f, 1.0f);
+        _pixelMatrix = viewport * GeProjectiveMatrix3<float>(projection);
+        _orthographic = projection(3, 2) == 0.0;
+    }
+
+    // Draws the instances into region, dividing it while its area exceeds the factory's limit.
+    void renderRegion(const RsGeomInstanceList& instances, const GeRectangle<int>& region) {
+        const long long area = static_cast<long long>(region.x1 - region.x0) *
+                               static_cast<long long>(region.y1 - region.y0);
+        if (area <= _factory->getMaxArea()) {
+            renderLeaf(instances, region);
+            return;
+        }
+        const int k = _factory->getKernelSize();
+        const int mx = static_cast<int>((static_cast<double>(region.x0) + region.x1) * 0.5);
+        const int my = static_cast<int>((static_cast<double>(region.y0) + region.y1) * 0.5);
+        renderRegion(instances, GeRectangle<int>(region.x0, mx + k, region.y0, my + k));
+        renderRegion(instances, GeRectangle<int>(mx - k, region.x1, region.y0, my + k));
+        renderRegion(instances, GeRectangle<int>(region.x0, mx + k, my - k, region.y1));
+        renderRegion(instances, GeRectangle<int>(mx - k, region.x1, my - k, region.y1));
+    }
+
+    const GeRectangle<int>& getRegion() const { return _region; }
+    const GeProjectiveMatrix3<double>& getProjection() const { return _projection; }
+    const GeProjectiveMatrix3<float>& getPixelMatrix() const { return _pixelMatrix; }
+    const GeAffineMatrix3<float>& getWorldToCamera() const { return _worldToCamera; }
+    bool isOrthographic() const { return _orthographic; }
+
+private:
+    void renderLeaf(const RsGeomInstanceList& instances, const GeRectangle<int>& region) {
+        RCShdPtr<Buffer> buffer = _factory->createBuffer(region);
+        {
+            RsRegionDrawer<Buffer> drawer(buffer, &_pixelMatrix, region, _orthographic);
+            for (const RCShdPtr<RsGeomInstance>& instance : instances) drawInstance(drawer, *instance, instance);
+            buffer->finalize();
+        }
+    }
+
+    static void drawInstance(RsRegionDrawer<Buffer>& drawer, const RsGeomInstance& geom,
+                             const RCShdPtr<RsGeomInstance>& instance) {
+        const SdMesh& mesh = *geom._mesh;
+        const unsigned int groups = mesh.getFaceGroupCount();
+        const RsGeomInstance::MaterialList& materials = geom._materials;
+        const std::size_t materialCount = materials.size();
+        // Face group g takes material g modulo the count, which needs a material.
+        ZR_ASSERT_AT(groups == 0 || materialCount != 0, "render\\suave\\src\\rsSceneRenderer", __LINE__);
+        bool withTangents = false;
+        for (unsigned int g = 0; g < groups && !withTangents; ++g)
+            withTangents = (materials[g % materialCount]->getNeededContext() &
+                            RsShadingContext::needsTangents) != 0;
+        drawer.setInstance(instance, true, withTangents, true);
+        for (unsigned int g = 0; g < groups; ++g) {
+            const SdMeshTypes::FaceGroup& group = mesh.getFaceGroup(g);
+            drawer.drawFaces(materials[g % materialCount], group._firstFace,
+                             group._firstFace + group._faceCount);
+        }
+    }
+
+    Factory* _factory;
+    GeRectangle<int> _region;
+    GeProjectiveMatrix3<double> _projection;
+    GeProjectiveMatrix3<float> _pixelMatrix;
+    GeAffineMatrix3<float> _worldToCamera;
+    bool _orthographic = false;
+};
+
+}  // namespace Zr
