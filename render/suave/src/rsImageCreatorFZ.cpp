@@ -7,6 +7,7 @@
 #include <memory>
 
 #include "osMemoryArch.h"
+#include "rsFZBuffer.h"
 #include "rsImageCreatorUtil.h"
 #include "rsTolerance.h"
 
@@ -71,6 +72,12 @@ void compositeRow(Rgba* row, int width, RsFragment* const* lists, bool scale, fl
 }
 
 }  // namespace
+
+void RsImageCreatorFZ::createImage(RsFZBuffer& buffer, const GeRectangle<int>& region, bool accumulate,
+                                   float weight, bool unpremultiply, const Rgba& fillColor,
+                                   const IxReadGuard& background, const IxWriteGuard& output) {
+    createImage(buffer.getLists(), region, accumulate, weight, unpremultiply, fillColor, background, output);
+}
 
 void RsImageCreatorFZ::createImage(RsFragment* const* lists, const GeRectangle<int>& region,
                                    bool accumulate, float weight, bool unpremultiply,

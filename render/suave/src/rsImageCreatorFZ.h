@@ -23,9 +23,18 @@
 
 namespace Zr {
 
+class RsDeepShadowMap;
+class RsFZBuffer;
+
 class RsImageCreatorFZ {
 public:
     using Rgba = CoRgbaColorTyped<float>;
+
+    // Resolves the buffer's fragment lists into the pixels of region, which is the buffer's own
+    // pixel region: as below, with the buffer's list heads.
+    static void createImage(RsFZBuffer& buffer, const GeRectangle<int>& region, bool accumulate, float weight,
+                            bool unpremultiply, const Rgba& fillColor, const IxReadGuard& background,
+                            const IxWriteGuard& output);
 
     // Resolves the pixels x0 <= x < x1, y0 <= y < y1 of region into output. lists holds one list
     // head per pixel of the region, row after row, region width entries per row. accumulate
@@ -35,6 +44,10 @@ public:
     static void createImage(RsFragment* const* lists, const GeRectangle<int>& region, bool accumulate,
                             float weight, bool unpremultiply, const Rgba& fillColor,
                             const IxReadGuard& background, const IxWriteGuard& output);
+
+    // Turns the fragments of the buffer's pixels x .. x + width, y .. y + height into the deep
+    // shadow map. Comes with the deep shadow map; until then it aborts.
+    static void createDeepShadowMap(RsFZBuffer& buffer, int x, int y, int width, int height, RsDeepShadowMap& map);
 
     RsImageCreatorFZ() = delete;
 };

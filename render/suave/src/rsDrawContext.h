@@ -1,0 +1,27 @@
+#pragma once
+// The drawing context that a region drawer hands through the rasterizer to the span methods of
+// the fragment buffers: what a span method needs to make a fragment besides the pixel data.
+//
+// The region drawer fills it once per drawing of a face group with one material: the transfer
+// function and opacity of the material's transfer mode, and the material itself. The shading
+// context is the drawer's one scratch record of what is known at a fragment: a span method fills
+// it from the pixel data and hands it to the material's shade, which may change it. It is mutable
+// because the rasterizer passes the drawing context on as const, and filling it is no change to
+// the drawing state.
+#include "rsMaterialShader.h"
+#include "rsShadingContext.h"
+#include "rsTransferFunc.h"
+
+namespace Zr {
+
+struct RsDrawContext {
+    // How the material's fragments are laid over what is behind them; stored in each fragment.
+    RsTransferFunc::Function _transfer = nullptr;
+    // Whether the transfer mode lets a fragment of alpha one hide everything behind it.
+    bool _canBeOpaque = false;
+    mutable RsShadingContext _shadingContext;
+    // The material being drawn; not owned, the drawer holds it for the drawing.
+    RsMaterialShader* _material = nullptr;
+};
+
+}  // namespace Zr

@@ -1,0 +1,169 @@
+#include "rsFZBuffer.h"
+
+#include <algorithm>
+
+#include "assertions.h"
+#include "rsImageCreatorFZ.h"
+#include "rsShadingInputs.h"
+#include "rsTolerance.h"
+
+namespace Zr {
+
+namespace {
+
+constexpr const char* kSourceFile = "render\\suave\\src\\rsFZBuffer";
+
+// The span method of a vertex kind for the buffer's mode.
+template <class Vertex>
+typename RsFZBuffer::Rasterizer<Vertex>::DrawSpan spanMethod(bool zBuffer) {
+    return zBuffer ? &RsFZBuffer::drawSpanZ<Vertex> : &RsFZBuffer::drawSpanNoZ<Vertex>;
+}
+
+}  // namespace
+
+RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply)
+    : _x(x),
+      _y(y),
+      _width(width),
+      _height(height),
+      _unpremultiply(unpremultiply),
+      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer), getPixelRegion()),
+      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer), getPixelRegion()),
+      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer), getPixelRegion()) {
+    ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
+    const std::size_t pixels = getPixelCount();
+    // One fragment per pixel in the first chunk: a region without overlap needs no other.
+    _pool = std::make_unique<RsFragmentPool>(static_cast<std::int32_t>(pixels));
+    _pool->allocateChunk(pixels * sizeof(RsFragment));
+    _lists = std::make_unique<RsFragment*[]>(pixels);  // all null
+    if (zBuffer) {
+        _zBuffer = std::make_unique_for_overwrite<double[]>(pixels);
+        std::fill(_zBuffer.get(), _zBuffer.get() + pixels, kEmptyDepth);
+    } else {
+        _closed = std::make_unique<unsigned char[]>(pixels);  // all open
+    }
+}
+
+RsFZBuffer::~RsFZBuffer() {
+    // The per-pixel arrays and the pool go first; the rasterizers and the guards follow as
+    // members.
+    _zBuffer.reset();
+    _closed.reset();
+    _lists.reset();
+    _pool.reset();
+}
+
+void RsFZBuffer::setOutput(const IxWriteGuard& output, const IxReadGuard& background, const Rgba& fillColor,
+                           bool accumulate, float weight) {
+    _output = output;
+    _background = background;
+    _fillColor = fillColor;
+    _accumulate = accumulate;
+    _weight = weight;
+    _deepShadowMap = nullptr;
+}
+
+void RsFZBuffer::setOutput(RsDeepShadowMap& map) { _deepShadowMap = &map; }
+
+void RsFZBuffer::finalize() {
+    if (_deepShadowMap != nullptr) {
+        RsImageCreatorFZ::createDeepShadowMap(*this, _x, _y, _width, _height, *_deepShadowMap);
+        return;
+    }
+    RsImageCreatorFZ::createImage(*this, getPixelRegion(), _accumulate, _weight, _unpremultiply, _fillColor,
+                                  _background, _output);
+}
+
+std::size_t RsFZBuffer::getMemorySize() const {
+    const std::size_t pixels = getPixelCount();
+    std::size_t bytes = sizeof(RsFZBuffer);
+    if (_pool) bytes += sizeof(RsFragmentPool) + _pool->getMemorySize();
+    if (_closed) bytes += pixels * sizeof(unsigned char);
+    if (_zBuffer) bytes += pixels * sizeof(double);
+    if (_lists) bytes += pixels * sizeof(RsFragment*);
+    return bytes;
+}
+
+template <class Vertex>
+RsFragment* RsFZBuffer::makeFragment(const Context& context, const RsPixelData<Vertex>& data) {
+    RsFragment* fragment = _pool->allocate();
+    fragment->_depth = data._z._q;
+    fragment->_transfer = context._transfer;
+    rsFillShadingContext(context._shadingContext, data);
+    fragment->_color = context._material->shade(context._shadingContext);
+    return fragment;
+}
+
+template <class Vertex>
+void RsFZBuffer::drawSpanNoZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data) {
+    const std::ptrdiff_t rowStart = std::ptrdiff_t(row) * _width;
+    unsigned char* const closed = _closed.get() + rowStart;
+    RsFragment** const lists = _lists.get() + rowStart;
+    for (int x = span._x1; x < span._x2; ++x) {
+        if (closed[x] == 0) {
+            RsFragment* fragment = makeFragment(context, data);
+            // The drawing order alone decides: the last drawn lies farthest.
+            fragment->_next = lists[x];
+            lists[x] = fragment;
+            if (context._canBeOpaque && RsTolerance::isOne(fragment->_color.a)) closed[x] = 1;
+        }
+        // Interpolants move on over closed pixels too.
+        data.stepX();
+    }
+}
+
+template <class Vertex>
+void RsFZBuffer::drawSpanZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data) {
+    const std::ptrdiff_t rowStart = std::ptrdiff_t(row) * _width;
+    double* const nearest = _zBuffer.get() + rowStart;
+    RsFragment** const lists = _lists.get() + rowStart;
+    for (int x = span._x1; x < span._x2; ++x) {
+        // At or behind the nearest opaque surface nothing is shaded.
+        if (nearest[x] > data._z._q) {
+            RsFragment* fragment = makeFragment(context, data);
+            const double depth = fragment->_depth;
+            const bool opaque = context._canBeOpaque && RsTolerance::isOne(fragment->_color.a);
+            RsFragment* const head = lists[x];
+            if (head == nullptr || depth >= head->_depth) {
+                // Farthest so far, or level with the head: the newcomer goes behind.
+                fragment->_next = head;
+                lists[x] = fragment;
+            } else {
+                RsFragment* prev = head;
+                while (prev->_next != nullptr && prev->_next->_depth > depth) prev = prev->_next;
+                fragment->_next = prev->_next;
+                // An opaque fragment drops everything behind it; the dropped ones stay in the pool.
+                if (opaque) lists[x] = fragment;
+                else prev->_next = fragment;
+            }
+            if (opaque) nearest[x] = depth;
+        }
+        data.stepX();
+    }
+}
+
+template void RsFZBuffer::drawSpanZ<RsPlainVertex>(const Context&, int, const Span&, RsPixelData<RsPlainVertex>&);
+template void RsFZBuffer::drawSpanZ<RsNormalVertex>(const Context&, int, const Span&, RsPixelData<RsNormalVertex>&);
+template void RsFZBuffer::drawSpanZ<RsTangentVertex>(const Context&, int, const Span&, RsPixelData<RsTangentVertex>&);
+template void RsFZBuffer::drawSpanNoZ<RsPlainVertex>(const Context&, int, const Span&, RsPixelData<RsPlainVertex>&);
+template void RsFZBuffer::drawSpanNoZ<RsNormalVertex>(const Context&, int, const Span&, RsPixelData<RsNormalVertex>&);
+template void RsFZBuffer::drawSpanNoZ<RsTangentVertex>(const Context&, int, const Span&,
+                                                        RsPixelData<RsTangentVertex>&);
+
+void RsFZBuffer::dump(std::ostream& os) const {
+    os << " _x: " << _x << " _y: " << _y << " _width: " << _width << " _height: " << _height
+       << " _accumulate: " << _accumulate << " _unpremultiply: " << _unpremultiply << " _weight: " << _weight
+       << " _background: ";
+    _background.dump(os);
+    os << " _output: ";
+    _output.dump(os);
+    os << " _fillColor: ";
+    _fillColor.dump(os);
+    os << " _closed: " << static_cast<const void*>(_closed.get())
+       << " _zBuffer: " << static_cast<const void*>(_zBuffer.get())
+       << " _lists: " << static_cast<const void*>(_lists.get()) << " _pool: ";
+    _pool->dump(os);
+    os << " _deepShadowMap: " << static_cast<const void*>(_deepShadowMap);
+}
+
+}  // namespace Zr

@@ -1,0 +1,143 @@
+#pragma once
+// The fragment buffer of the drawing path without anti-aliasing: one rectangular region of the
+// picture, a list of shaded fragments per pixel, resolved into the output tile by finalize.
+//
+// Triangles come in through the three rasterizers, one per vertex kind; the buffer's span methods
+// shade each pixel that is to get a fragment at once (the material's shade is called when the
+// fragment is made, never later) and link the fragment into the pixel's list. Lists run from far
+// to near, head farthest, in both of the buffer's modes:
+// - with Z, each list is kept sorted by depth: a fragment goes in at its depth, behind the ones
+//   of equal depth that came before it. An opaque fragment cuts off everything behind it and
+//   becomes the list's head; its depth goes to the Z-buffer, and later fragments at or behind it
+//   are rejected before anything is shaded.
+// - without Z, depth is not compared at all: each fragment is pushed at the head, as the instances
+//   come in order from near to far. An opaque fragment closes its pixel to all later ones.
+// A fragment is opaque when its material's mode can be opaque and its alpha is one within the
+// float tolerance (RsTolerance::isOne).
+//
+// Fragments come from a pool of chunks that is never freed piecemeal; the first chunk holds one
+// fragment per pixel.
+#include <cstddef>
+#include <memory>
+#include <ostream>
+#include <type_traits>
+
+#include "coRgbaColorTyped.h"
+#include "geRectangle.h"
+#include "ixTileManip.h"
+#include "rcBase.h"
+#include "rsDrawContext.h"
+#include "rsFragment.h"
+#include "rsFragmentPool.h"
+#include "rsPixelData.h"
+#include "rsPixelSpan.h"
+#include "rsRasterizer.h"
+#include "rsVertices.h"
+
+namespace Zr {
+
+class RsDeepShadowMap;
+
+class RsFZBuffer : public RCObject, public IxTileManip {
+public:
+    using Rgba = CoRgbaColorTyped<float>;
+    using Context = RsDrawContext;
+    using Span = RsPixelSpan<0, 0>;
+    template <class Vertex>
+    using Rasterizer = RsRasterizer<RsFZBuffer, Vertex, Span>;
+
+    // The depth that an empty Z-buffer entry holds: the largest finite double.
+    static constexpr double kEmptyDepth = 1.7976931348623157e308;
+
+    // A buffer for the pixels x <= px < x + width, y <= py < y + height, with a Z-buffer when
+    // zBuffer is set. unpremultiply is handed to the resolve. The fill colour starts as opaque
+    // black, the guards empty.
+    RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply);
+    ~RsFZBuffer() override;
+    RsFZBuffer(const RsFZBuffer&) = delete;
+    RsFZBuffer& operator=(const RsFZBuffer&) = delete;
+
+    // Where and how finalize resolves: the output tile, the background (may be empty), the fill
+    // colour of pixels that the background does not cover, whether to add to the output, and the
+    // weight of the finished pixels. Clears a deep shadow map set before.
+    void setOutput(const IxWriteGuard& output, const IxReadGuard& background, const Rgba& fillColor,
+                   bool accumulate, float weight);
+    // Makes finalize turn the fragments into the deep shadow map instead.
+    void setOutput(RsDeepShadowMap& map);
+
+    // Resolves the fragments into the output set last.
+    void finalize();
+
+    // Bytes held: the object, its pool and the pool's chunks, and the per-pixel arrays.
+    std::size_t getMemorySize() const;
+
+    // The buffer's pixels in image coordinates.
+    GeRectangle<int> getPixelRegion() const { return {_x, _x + _width, _y, _y + _height}; }
+    int getX() const { return _x; }
+    int getY() const { return _y; }
+    int getWidth() const { return _width; }
+    int getHeight() const { return _height; }
+    bool hasZBuffer() const { return _zBuffer != nullptr; }
+
+    // The rasterizer of a vertex kind: RsPlainVertex, RsNormalVertex or RsTangentVertex.
+    template <class Vertex>
+    const Rasterizer<Vertex>& getRasterizer() const {
+        if constexpr (std::is_same_v<Vertex, RsPlainVertex>) return _rasterizerPlain;
+        else if constexpr (std::is_same_v<Vertex, RsNormalVertex>) return _rasterizerNormal;
+        else {
+            static_assert(std::is_same_v<Vertex, RsTangentVertex>, "no rasterizer for this vertex kind");
+            return _rasterizerTangent;
+        }
+    }
+    // Draws a triangle of vertices after the perspective division, in image pixel coordinates,
+    // through the rasterizer of their kind.
+    template <class Vertex>
+    void rasterizeTriangle(const Context& context, const Vertex& v0, const Vertex& v1, const Vertex& v2) const {
+        getRasterizer<Vertex>().rasterizeTriangle(context, v0, v1, v2);
+    }
+
+    // The span methods, for the pixels [span._x1, span._x2) of region-relative row `row`, with the
+    // pixel data placed at the first of them: with and without Z. Defined for the three vertex
+    // kinds of the rasterizers.
+    template <class Vertex>
+    void drawSpanZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data);
+    template <class Vertex>
+    void drawSpanNoZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data);
+
+    // The list head of each pixel, row after row, getWidth() per row. For the resolve.
+    RsFragment* const* getLists() const { return _lists.get(); }
+    // The depth of the nearest opaque fragment of each pixel, in the mode with Z; else null.
+    const double* getZBuffer() const { return _zBuffer.get(); }
+    // Non-zero for each pixel that an opaque fragment has closed, in the mode without Z; else null.
+    const unsigned char* getClosed() const { return _closed.get(); }
+    const RsFragmentPool& getPool() const { return *_pool; }
+
+    void dump(std::ostream& os) const;
+
+private:
+    std::size_t getPixelCount() const { return static_cast<std::size_t>(_width) * static_cast<std::size_t>(_height); }
+    // Shades a new fragment at the pixel that the data stands for.
+    template <class Vertex>
+    RsFragment* makeFragment(const Context& context, const RsPixelData<Vertex>& data);
+
+    int _x;
+    int _y;
+    int _width;
+    int _height;
+    bool _accumulate = false;
+    bool _unpremultiply;
+    float _weight = 1.0f;
+    ReadGuardNoCheck _background;
+    WriteGuardNoCheck _output;
+    Rgba _fillColor{0.0f, 0.0f, 0.0f, 1.0f};
+    std::unique_ptr<unsigned char[]> _closed;
+    std::unique_ptr<double[]> _zBuffer;
+    std::unique_ptr<RsFragment*[]> _lists;
+    std::unique_ptr<RsFragmentPool> _pool;
+    RsDeepShadowMap* _deepShadowMap = nullptr;
+    Rasterizer<RsTangentVertex> _rasterizerTangent;
+    Rasterizer<RsPlainVertex> _rasterizerPlain;
+    Rasterizer<RsNormalVertex> _rasterizerNormal;
+};
+
+}  // namespace Zr

@@ -1,0 +1,70 @@
+#pragma once
+// What all the region buffers of one render call without anti-aliasing share, and the making of
+// one buffer per region. The render driver configures the factory once per call and then asks it
+// for the pixel region to draw and for a buffer for each region it draws.
+//
+// The path has no filter, so regions need no margin (kernel size 0); a region of at most 16384
+// pixels (128 x 128) is drawn as one.
+#include <ostream>
+
+#include "coRgbaColorTyped.h"
+#include "geRectangle.h"
+#include "ixTileManip.h"
+#include "rcShdPtr.h"
+#include "rsFZBuffer.h"
+
+namespace Zr {
+
+class RsDeepShadowMap;
+
+class RsFZBufferFactory {
+public:
+    using Buffer = RsFZBuffer;
+    using Rgba = CoRgbaColorTyped<float>;
+
+    static constexpr int kMaxArea = 16384;
+
+    // Depth test on, no output, not accumulating, weight 1, opaque black fill, no background, no
+    // deep shadow map, unpremultiplied output.
+    RsFZBufferFactory();
+
+    int getKernelSize() const { return 0; }
+    int getMaxArea() const { return kMaxArea; }
+    // The output guard's rectangle; with a deep shadow map as output, the square from 0 to the
+    // map's size.
+    GeRectangle<int> getPixelRegion() const;
+    // A buffer for the region, directed at the factory's output.
+    RCShdPtr<RsFZBuffer> createBuffer(const GeRectangle<int>& region) const;
+
+    void setUnpremultiply(bool unpremultiply) { _unpremultiply = unpremultiply; }
+    void setZBuffer(bool zBuffer) { _zBuffer = zBuffer; }
+    void setFillColor(const Rgba& fillColor) { _fillColor = fillColor; }
+    void setBackground(const IxReadGuard& background) { _background = background; }
+    // The output tile, whether the resolve adds to it instead of replacing it, and the weight of
+    // the finished pixels.
+    void setOutput(const IxWriteGuard& output, bool accumulate, float weight);
+    void setOutput(RsDeepShadowMap& map) { _deepShadowMap = &map; }
+
+    bool getZBuffer() const { return _zBuffer; }
+    bool getUnpremultiply() const { return _unpremultiply; }
+    bool getAccumulate() const { return _accumulate; }
+    float getWeight() const { return _weight; }
+    const Rgba& getFillColor() const { return _fillColor; }
+
+    void dump(std::ostream& os) const;
+
+private:
+    // The square of the deep shadow map's size.
+    GeRectangle<int> getDeepShadowMapRegion() const;
+
+    bool _zBuffer = true;
+    IxTileManip::WriteGuardNoCheck _output;
+    bool _accumulate = false;
+    float _weight = 1.0f;
+    Rgba _fillColor;
+    IxTileManip::ReadGuardNoCheck _background;
+    RsDeepShadowMap* _deepShadowMap = nullptr;
+    bool _unpremultiply = true;
+};
+
+}  // namespace Zr
