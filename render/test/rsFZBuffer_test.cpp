@@ -180,21 +180,5 @@ TEST(RsFZBuffer, TrianglesThroughAllRasterizersResolveToTheLayeredComposite) {
     }
 }
 
-// The span methods fill the shading context from the pixel data before shade: here the eye
-// position that a hand-made span runs along, seen by the material at each pixel.
-TEST(RsFZBuffer, ShadeSeesThePixelsOwnShadingContext) {
-    std::vector<int> seen;
-    const auto material = makeShared<ScriptedMaterial>([&](const RsShadingContext& c) {
-        seen.push_back(pixelOf(c));
-        return Rgba(0, 0, 0, 0.5f);
-    });
-    for (bool zBuffer : {false, true}) {
-        seen.clear();
-        RsFZBuffer buffer(0, 0, 9, 1, zBuffer, true);
-        feedSpan(buffer, makeContext(*material, RsTransferFunc::getFunction(Mode::normal), true), 0, 2, 7, 0, 0.5, 0.0);
-        EXPECT_EQ(seen, (std::vector<int>{2, 3, 4, 5, 6}));
-    }
-}
-
 }  // namespace
 }  // namespace Zr
