@@ -239,8 +239,9 @@ TEST(RsRenderRegions, ClippedTrianglesDrawExactlyTheirVisiblePart) {
 // their screen derivatives are those of the exact projective map.
 TEST(RsRenderRegions, TextureCoordinatesArePerspectiveCorrect) {
     const View view;
-    // Receding almost along the view: from z = -1 at the bottom of the picture to z = -60.
-    const std::vector<GePoint3<float>> corners = {{-2, -0.8f, -1}, {2, -0.8f, -1}, {2, 0.2f, -60}, {-2, 0.2f, -60}};
+    // A parallelogram receding almost along the view, from z = -1.2 near the bottom of the
+    // picture to z = -62.8, and turned about y as well, so that 1/w changes along both axes.
+    const std::vector<GePoint3<float>> corners = {{-2, -0.8f, -1.2f}, {2, -0.8f, -2.8f}, {2, 0.2f, -62.8f}, {-2, 0.2f, -61.2f}};
     const std::vector<GePoint3<float>> tex = {{0, 0, 0}, {3, 0, 0}, {3, 7, 0}, {0, 7, 0}};
     ConstantMaterial::Settings settings;
     settings.needed = 0x3cu;
@@ -257,8 +258,12 @@ TEST(RsRenderRegions, TextureCoordinatesArePerspectiveCorrect) {
         const V3 ray{(x - sx) / sx / view.projection(0, 0), (y - sy) / sy / view.projection(1, 1), -1.0};
         const V3 normal = (b - a).cross(d - a);
         const V3 p = ray * (normal.dot(a) / normal.dot(ray));
-        const V3 u = b - a, v = d - a;
-        return std::pair{3.0 * (p - a).dot(u) / u.dot(u), 7.0 * (p - a).dot(v) / v.dot(v)};
+        // p - a = alpha * u + beta * v, by the normal equations.
+        const V3 u = b - a, v = d - a, q = p - a;
+        const double uu = u.dot(u), uv = u.dot(v), vv = v.dot(v), det = uu * vv - uv * uv;
+        const double alpha = (q.dot(u) * vv - q.dot(v) * uv) / det;
+        const double beta = (q.dot(v) * uu - q.dot(u) * uv) / det;
+        return std::pair{3.0 * alpha, 7.0 * beta};
     };
     int checked = 0;
     for (const auto& [pixel, fragments] : recording.pixels) {
@@ -284,6 +289,115 @@ TEST(RsRenderRegions, TextureCoordinatesArePerspectiveCorrect) {
         ++checked;
     }
     EXPECT_GT(checked, 500);
+}
+
+// Wire rings: a pixel gets a fragment exactly when its centre lies in the triangle within the wire
+// width of an edge - measured on the screen in pixels (three quarters of the wire size), or in eye
+// space at the point seen - and never more than one.
+TEST(RsRenderRegions, WireRingsCoverABandAlongTheEdges) {
+    std::mt19937 rng(31);
+    std::uniform_real_distribution<float> xy(-2.5f, 2.5f), depth(-6.0f, -3.0f), size(0.5f, 4.0f);
+    const View view;
+    auto project = [&](const V3& p) {
+        return std::pair{32.0 + 32.0 * view.projection(0, 0) * p.x / -p.z,
+                         24.0 + 24.0 * view.projection(1, 1) * p.y / -p.z};
+    };
+    // Distance from p to the line through a and b, in 2D or 3D.
+    auto lineDistance = [](const V3& p, const V3& a, const V3& b) {
+        const V3 u = b - a, v = p - a;
+        const V3 c = u.cross(v);
+        return std::sqrt(c.dot(c) / u.dot(u));
+    };
+    int banded = 0, trials = 0;
+    while (trials < 24) {
+        const bool screenSpace = trials % 2 == 0;
+        const std::vector<GePoint3<float>> corners = {{xy(rng), xy(rng), depth(rng)},
+                                                      {xy(rng), xy(rng), depth(rng)},
+                                                      {xy(rng), xy(rng), depth(rng)}};
+        const V3 a = toV3(corners[0]), b = toV3(corners[1]), c = toV3(corners[2]);
+        ConstantMaterial::Settings settings;
+        settings.wireframe = true;
+        settings.screenSpace = screenSpace;
+        settings.wireSize = screenSpace ? size(rng) : 0.05f * size(rng);
+        settings.needed = trials % 3 == 0 ? 0u : (trials % 3 == 1 ? 0x02u : 0x40u);
+        const double width = screenSpace ? 0.75 * settings.wireSize : settings.wireSize;
+        // The triangle where widths are measured: on the screen (z = 0) or in eye space.
+        V3 t[3] = {a, b, c};
+        if (screenSpace)
+            for (V3& v : t) {
+                const auto [px, py] = project(v);
+                v = {px, py, 0.0};
+            }
+        const V3 n = (t[1] - t[0]).cross(t[2] - t[0]);
+        const double perimeter = std::sqrt((t[1] - t[0]).dot(t[1] - t[0])) +
+                                 std::sqrt((t[2] - t[1]).dot(t[2] - t[1])) + std::sqrt((t[0] - t[2]).dot(t[0] - t[2]));
+        const double inradius = std::sqrt(n.dot(n)) / perimeter;
+        // Either a ring with a hole, or a triangle narrower than its wire, which is drawn whole.
+        const double minHeight = std::sqrt(n.dot(n)) /
+                                 std::max({std::sqrt((t[1] - t[0]).dot(t[1] - t[0])), std::sqrt((t[2] - t[1]).dot(t[2] - t[1])),
+                                           std::sqrt((t[0] - t[2]).dot(t[0] - t[2]))});
+        const bool whole = minHeight < width;
+        if (!whole && inradius < 1.5 * width) continue;
+        ++trials;
+        const RCShdPtr<RsScene> scene = makeScene({makeInstance(makeMesh(corners, {0, 1, 2}), material(settings))});
+        Recording recording;
+        EXPECT_EQ(renderRecording(scene, {}, view.projection, view.rect, randomLimit(rng), recording), 0);
+        for (int py = view.rect.y0; py < view.rect.y1; ++py)
+            for (int px = view.rect.x0; px < view.rect.x1; ++px) {
+                const auto it = recording.pixels.find({px, py});
+                const int count = it == recording.pixels.end() ? 0 : static_cast<int>(it->second.size());
+                ASSERT_LE(count, 1);
+                const Hit hit = castRay(view, px, py, a, b, c);
+                if (hit.ambiguous) continue;
+                const V3 p = screenSpace ? V3{px + 0.5, py + 0.5, 0.0} : hit.point;
+                const double d = std::min({lineDistance(p, t[0], t[1]), lineDistance(p, t[1], t[2]),
+                                           lineDistance(p, t[2], t[0])});
+                if (!whole && std::abs(d - width) < 1e-3 * std::max(1.0, width)) continue;
+                const bool expected = hit.seen && (whole || d < width);
+                EXPECT_EQ(count, expected ? 1 : 0) << px << ", " << py << " trial " << trials;
+                banded += expected && !whole;
+            }
+    }
+    EXPECT_GT(banded, 1000);
+}
+
+// Random overlapping triangles with every drawing path: the fragments of a picture cut into
+// many regions are those of the picture drawn as one region, pixel by pixel and in order.
+TEST(RsRenderRegions, SplitRenderEqualsSingleRegion) {
+    std::mt19937 rng(47);
+    std::uniform_real_distribution<float> xy(-3.0f, 3.0f), depth(-8.0f, 0.3f), unit(0.0f, 1.0f);
+    const View view;
+    for (int trial = 0; trial < 6; ++trial) {
+        std::vector<RCShdPtr<RsGeomInstance>> instances;
+        for (int i = 0; i < 12; ++i) {
+            std::vector<GePoint3<float>> corners;
+            for (int k = 0; k < 3; ++k) corners.emplace_back(xy(rng), xy(rng), depth(rng));
+            ConstantMaterial::Settings settings;
+            settings.colour = {unit(rng), unit(rng), unit(rng), unit(rng)};
+            settings.needed = (i % 3 == 0) ? 0x01u : (i % 3 == 1 ? 0x3eu : 0x7fu);
+            settings.wireframe = i % 4 == 3;
+            settings.screenSpace = i % 8 == 3;
+            settings.wireSize = settings.screenSpace ? 3.0f : 0.2f;
+            instances.push_back(makeInstance(makeMesh(corners, {0, 1, 2}, corners), material(settings),
+                                             GeAffineMatrix3<float>(), int(rng() % 3)));
+        }
+        const RCShdPtr<RsScene> scene = makeScene(instances);
+        Recording whole, split;
+        renderRecording(scene, {}, view.projection, view.rect, 16384, whole);
+        renderRecording(scene, {}, view.projection, view.rect, std::min(randomLimit(rng), 1000), split);
+        ASSERT_GT(whole.pixels.size(), 500u);
+        ASSERT_EQ(whole.pixels.size(), split.pixels.size());
+        for (const auto& [pixel, fragments] : whole.pixels) {
+            const std::vector<Fragment>& other = split.pixels[pixel];
+            ASSERT_EQ(fragments.size(), other.size()) << pixel.first << ", " << pixel.second;
+            for (std::size_t i = 0; i < fragments.size(); ++i) {
+                EXPECT_EQ(fragments[i].colour, other[i].colour);
+                EXPECT_NEAR(fragments[i].depth, other[i].depth, 1e-9);
+                EXPECT_NEAR(fragments[i].texCoord.x, other[i].texCoord.x, 1e-5);
+                EXPECT_NEAR(fragments[i].normal.z, other[i].normal.z, 1e-4);
+            }
+        }
+    }
 }
 
 }  // namespace

@@ -1,0 +1,94 @@
+#include "rsRenderer.h"
+
+#include "assertions.h"
+#include "geFrustum.h"
+#include "rcStrongPtr.h"
+#include "rsCullAndSort.h"
+#include "rsFZBufferFactory.h"
+#include "rsSceneRenderer.h"
+#include "sdCamera.h"
+
+namespace Zr {
+
+namespace {
+
+const char* const kSourcePath = "render\\suave\\src\\rsRenderer";
+
+// Lights with per-render work build their view and their shadow maps here, before any pixel is
+// drawn, in the scene's order.
+template <class Light>
+void prepareLight(Light& light, const GeAffineMatrix3<float>& worldToCamera, RCShdPtr<RsScene>& scene) {
+    if constexpr (requires { light.setupRender(worldToCamera); }) light.setupRender(worldToCamera);
+    if constexpr (requires { light.initializeMaps(scene); }) light.initializeMaps(scene);
+}
+
+// Steps 2 to 7 of a render on the path of Factory, whose settings are made: the scene renderer
+// with its matrices, the lights, the culled instance list, and the region recursion over the
+// factory's pixel region. Locals go in the reverse order of their making: frustum, list, scene
+// renderer; the caller's factory last.
+template <class Factory>
+void renderWithFactory(Factory& factory, const RCShdPtr<RsScene>& scene, bool zBuffer,
+                       const GeAffineMatrix3<float>& worldToCamera,
+                       const GeProjectiveMatrix3<double>& projection, const GeRectangle<int>& rectangle) {
+    RCStrongPtr<RsSceneRenderer<Factory>> sceneRenderer(new RsSceneRenderer<Factory>(factory));
+    sceneRenderer->setup(worldToCamera, projection, rectangle);
+
+    RCShdPtr<RsScene> sceneRef = scene;
+    for (const RCShdPtr<RsLightShader>& light : sceneRef->_lights)
+        prepareLight(*light, sceneRenderer->getWorldToCamera(), sceneRef);
+
+    const GeRectangle<int> pixelRegion = factory.getPixelRegion();
+    RsGeomInstanceList instances;
+    const GeFrustum<double> frustum(sceneRenderer->getProjection());
+    cullAndSortInstances(scene, zBuffer, frustum, sceneRenderer->getWorldToCamera(), instances);
+    sceneRenderer->renderRegion(instances, pixelRegion);
+}
+
+}  // namespace
+
+RsRenderer::RsRenderer() = default;
+
+RsRenderer::~RsRenderer() = default;
+
+void RsRenderer::render(const GeAffineMatrix3<float>& worldToCamera, const GeProjectiveMatrix3<double>& projection,
+                        const RCShdPtr<RsScene>& scene, const GeRectangle<int>& rectangle,
+                        const IxWriteGuard& output) {
+    renderCommon(scene, worldToCamera, projection, false, 1.0f, rectangle, output, true);
+}
+
+void RsRenderer::render(const RCShdPtr<SdInstance>& camera, const RCShdPtr<RsScene>& scene,
+                        const GeRectangle<int>& rectangle, const IxWriteGuard& output) {
+    const SdInstance& instance = *camera;
+    const SdCamera* sdCamera = dynamic_cast<const SdCamera*>(instance.getObject().get());
+    if (sdCamera == nullptr) return;
+    const GeAffineMatrix3<float> worldToCamera = instance.getMatrix().computeInverse();
+    GeProjectiveMatrix3<double> projection;
+    sdCamera->computeProjection(projection);
+    renderCommon(scene, worldToCamera, projection, false, 1.0f, rectangle, output, true);
+}
+
+void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatrix3<float>& worldToCamera,
+                              const GeProjectiveMatrix3<double>& projection, bool accumulate, float weight,
+                              const GeRectangle<int>& rectangle, const IxWriteGuard& output,
+                              bool unpremultiply) {
+    if (_antialiasing)
+        Assertions::throwProgramAborted(kSourcePath, __LINE__,
+                                        "antialiased rendering is not available: the A-buffer path is missing");
+    RsFZBufferFactory factory;
+    factory.setZBuffer(_zBuffer);
+    factory.setOutput(output, accumulate, weight);
+    factory.setFillColor(_fillColor);
+    factory.setBackground(_background);
+    factory.setUnpremultiply(unpremultiply);
+    renderWithFactory(factory, scene, _zBuffer, worldToCamera, projection, rectangle);
+}
+
+unsigned int RsRenderer::getMemUsageMb() const {
+    Assertions::throwProgramAborted(kSourcePath, 397, nullptr);
+}
+
+unsigned int RsRenderer::getTileMemUsageMb() const {
+    Assertions::throwProgramAborted(kSourcePath, 409, nullptr);
+}
+
+}  // namespace Zr
