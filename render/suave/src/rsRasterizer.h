@@ -140,11 +140,15 @@ public:
     // already stored; the edges are left at row yEnd.
     void rasterizeHalfTriangle(const Context& context, int yStart, int yEnd, Edge& left, Edge& right,
                                int& spanCount, PixelData& data) const {
+        if (yStart >= yEnd) return;
         PixelSpan* const spans = _spans.get();
         const int blockHeight = _blockHeight;
+        // The manager is a process-wide singleton: looked up once, asked on every row.
+        PxRequestMgr* const requests = PxRequestMgr::getInstance();
         int count = spanCount;
         for (int y = yStart; y < yEnd; ++y) {
-            checkInterrupt();
+            // Lets the host stop the work; leaves by exception when it does.
+            if (requests) requests->checkInterrupt();
             if constexpr (!kSubPixel) {
                 PixelSpan& span = spans[count];
                 span._x1 = rsCeil(left._currentX);
@@ -283,11 +287,6 @@ private:
             }
         }
         if (spanCount != 0) drawSpans(context, data, spanCount, yBottom - 1);
-    }
-
-    // Lets the host stop the work; leaves by exception when it does.
-    static void checkInterrupt() {
-        if (PxRequestMgr* manager = PxRequestMgr::getInstance()) manager->checkInterrupt();
     }
 
     Buffer& _buffer;
