@@ -1,0 +1,101 @@
+// Whole render calls of RsRenderer on the fragment Z-buffer path: the sample scene of zrender,
+// a mesh of about 100,000 small triangles, and ten transparent layers over the whole picture.
+// Each reports megapixels and fragments (shaded surface samples) per second.
+#include <benchmark/benchmark.h>
+
+#include <cstdint>
+#include <vector>
+
+#include "ixTile.h"
+#include "ixWriteGuard.h"
+#include "rsRenderer.h"
+#include "zrDiffuseShader.h"
+#include "zrSampleScene.h"
+#include "zrSceneKit.h"
+#include "zrShapes.h"
+
+namespace {
+
+using namespace Zr;
+
+// The host's shader, counting its calls: one call per fragment.
+class CountingShader : public ZrDiffuseShader {
+public:
+    CountingShader(const RCShdPtr<const SdMaterial>& material, std::uint64_t& count)
+        : ZrDiffuseShader(material), _count(count) {}
+    CoRgbaColorTyped<float> shade(RsShadingContext& context) override {
+        ++_count;
+        return ZrDiffuseShader::shade(context);
+    }
+
+private:
+    std::uint64_t& _count;
+};
+
+ZrSceneKit::ShaderMaker countingShaders(std::uint64_t& count) {
+    return [&count](const RCShdPtr<const SdMaterial>& material) -> RCShdPtr<RsMaterialShader> {
+        return makeShared<CountingShader>(material, count);
+    };
+}
+
+// Renders scene through camera at the size of the benchmark's two arguments, once per iteration.
+void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const RCShdPtr<SdInstance>& camera,
+                const std::uint64_t& fragments) {
+    const int width = static_cast<int>(state.range(0));
+    const int height = static_cast<int>(state.range(1));
+    const GeRectangle<int> rectangle{0, width, 0, height};
+    IxTile tile(IxPixelFormat(IxPixelFormat::RGBA, IxPixelFormat::UINT8), rectangle, {0.0f, 0.0f, 0.0f, 0.0f});
+    const IxWriteGuard output(tile);
+    RCShdPtr<RsRenderer> renderer = makeShared<RsRenderer>();
+    renderer->setFillColor({0.16f, 0.18f, 0.23f, 1.0f});
+
+    const std::uint64_t fragmentsBefore = fragments;
+    for (auto _ : state) renderer->render(camera, scene, rectangle, output);
+
+    const double megapixels = static_cast<double>(width) * height / 1e6;
+    state.counters["Mpixels/s"] = benchmark::Counter(megapixels, benchmark::Counter::kIsIterationInvariantRate);
+    state.counters["fragments/s"] = benchmark::Counter(static_cast<double>(fragments - fragmentsBefore),
+                                                       benchmark::Counter::kIsRate, benchmark::Counter::OneK::kIs1000);
+}
+
+void BM_SampleScene(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    const RCShdPtr<RsScene> scene = ZrSampleScene::makeScene(countingShaders(fragments));
+    renderLoop(state, scene, ZrSampleScene::makeCamera(static_cast<int>(state.range(0)), static_cast<int>(state.range(1))),
+               fragments);
+}
+BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Unit(benchmark::kMillisecond);
+
+// A square of 224 by 224 cells, two triangles each (100,352 triangles), facing the camera and
+// filling the picture: about 2.6 pixels per triangle at 512 by 512.
+void BM_SmallTriangles(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    const RCShdPtr<RsScene> scene = ZrSceneKit::makeScene({ZrSceneKit::makeInstance(
+        ZrShapes::makeGrid(10.0f, 224, false), {ZrSceneKit::makeMaterial({0.6f, 0.7f, 0.8f})},
+        ZrSceneKit::makePlacement({0, 0, 0}, {1, 0, 0}, 90.0), countingShaders(fragments))});
+    const double aspect = static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
+    renderLoop(state, scene, ZrSceneKit::makeCamera({0, 0, 12}, {0, 0, 0}, 40.0, aspect, 1.0f, 100.0f), fragments);
+}
+BENCHMARK(BM_SmallTriangles)->Args({512, 512})->Unit(benchmark::kMillisecond);
+
+// Ten squares one behind the other, each larger than the view, of opacity 0.3: every pixel
+// composites ten fragments.
+void BM_TransparentLayers(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    std::vector<RCShdPtr<RsGeomInstance>> layers;
+    const RCShdPtr<const SdMesh> square = ZrShapes::makeGrid(1.0f, 1, false);
+    for (int i = 0; i < 10; ++i) {
+        const float shade = 0.1f * static_cast<float>(i);
+        layers.push_back(ZrSceneKit::makeInstance(
+            square, {ZrSceneKit::makeMaterial({shade, 0.5f, 1.0f - shade}, 0.3f)},
+            ZrSceneKit::makePlacement({0, 0, -0.5 * i}, {1, 0, 0}, 90.0, 40.0), countingShaders(fragments)));
+    }
+    const RCShdPtr<RsScene> scene = ZrSceneKit::makeScene(std::move(layers));
+    const double aspect = static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
+    renderLoop(state, scene, ZrSceneKit::makeCamera({0, 0, 10}, {0, 0, 0}, 40.0, aspect, 1.0f, 100.0f), fragments);
+}
+BENCHMARK(BM_TransparentLayers)->Args({512, 512})->Args({1920, 1080})->Unit(benchmark::kMillisecond);
+
+}  // namespace
+
+BENCHMARK_MAIN();
