@@ -196,26 +196,6 @@ TEST(RsRasterizerSpans, EightByFourSpansTakeTheXShiftForRows) {
     }
 }
 
-// Several triangles in a row through one rasterizer, in any order: each draws as it would alone.
-TEST(RsRasterizerSpans, TrianglesDoNotInfluenceEachOther) {
-    const GeRectangle<int> region{0, 48, 0, 40};
-    std::mt19937 rng(3);
-    std::vector<std::array<Pt, 3>> triangles;
-    for (int i = 0; i < 40; ++i) {
-        std::array<Pt, 3> t;
-        for (Pt& p : t) p = {randomCoord(rng, 0, 48), randomCoord(rng, 0, 40)};
-        triangles.push_back(t);
-    }
-    Harness<RsPlainVertex, RsPixelSpan<4, 4>> shared(region, 5, 3);
-    for (const auto& t : triangles) {
-        Harness<RsPlainVertex, RsPixelSpan<4, 4>> alone(region, 5, 3);
-        alone.draw(t[0], t[1], t[2]);
-        shared.buffer().clear();
-        shared.draw(t[0], t[1], t[2]);
-        ASSERT_EQ(shared.buffer().counts(), alone.buffer().counts());
-    }
-}
-
 // The construction from the buffer takes its rectangle and the block sizes of the image cache.
 TEST(RsRasterizerSpans, TakesRegionFromBufferAndBlocksFromImageCache) {
     using Buffer = RecordingBuffer<RsDepthVertex, RsPixelSpan<0, 0>>;
