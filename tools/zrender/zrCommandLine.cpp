@@ -99,23 +99,23 @@ bool ZrCommandLine::parse(const std::vector<std::string>& arguments, ZrCommandLi
                           std::string& error) {
     for (std::size_t i = 0; i < arguments.size(); ++i) {
         const std::string& argument = arguments[i];
-        const OptionSpec* spec = nullptr;
+        const OptionSpec* option = nullptr;
         for (const OptionSpec& s : optionTable()) {
-            if (argument == s.name || (s.alias && argument == s.alias)) spec = &s;
+            if (argument == s.name || (s.alias && argument == s.alias)) option = &s;
         }
-        if (!spec) {
+        if (!option) {
             error = "unknown option: " + argument;
             return false;
         }
         std::string value;
-        if (spec->valueName) {
+        if (option->valueName) {
             if (i + 1 >= arguments.size()) {
-                error = std::string("option ") + spec->name + " needs a value " + spec->valueName;
+                error = std::string("option ") + option->name + " needs a value " + option->valueName;
                 return false;
             }
             value = arguments[++i];
         }
-        if (!spec->apply(result, value, error)) return false;
+        if (!option->apply(result, value, error)) return false;
     }
     return true;
 }
