@@ -59,7 +59,12 @@ TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
             layers.push_back(layer);
             ProbeMaterial::Settings settings;
             settings.colour = layer.colour;
-            instances.push_back(makeInstance(quad(w, h, x0, x1, y0, y1, z), settings));
+            // Wound towards the camera or away from it, and drawn on one side or both.
+            const bool front = rng() % 2;
+            instances.push_back(makeInstance(quad(w, h, front ? x0 : x1, front ? x1 : x0, y0, y1, z), settings));
+            instances.back()->_drawFrontFaces = rng() % 3 != 0;
+            instances.back()->_drawBackFaces = rng() % 3 != 0;
+            if (!(front ? instances.back()->_drawFrontFaces : instances.back()->_drawBackFaces)) layers.pop_back();
         }
         const RCShdPtr<RsScene> scene = makeScene(instances);
         const GeProjectiveMatrix3<double> projection = parallel(w, h, 0.5, 20.0);
@@ -107,15 +112,39 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
     std::mt19937 rng(8);
     std::uniform_real_distribution<double> unit(-1.0, 1.0);
     const GeRectangle<int> rect{-150, 170, -90, 150};  // 76800 pixels: many regions
+    // Four corners and the outward normal per face, so that the faces are flat and wound outwards.
+    SdMeshBuilder builder;
     std::vector<GePoint3<float>> corners;
-    for (int c = 0; c < 8; ++c) corners.emplace_back(c & 1 ? 1.0f : -1.0f, c & 2 ? 1.0f : -1.0f, c & 4 ? 1.0f : -1.0f);
-    const RCShdPtr<const SdMesh> box = makeMesh(corners, {0, 2, 3, 0, 3, 1, 4, 5, 7, 4, 7, 6, 0, 1, 5, 0, 5, 4,
-                                                          2, 6, 7, 2, 7, 3, 0, 4, 6, 0, 6, 2, 1, 3, 7, 1, 7, 5});
+    std::vector<GeVector3<float>> normals;
+    std::vector<std::uint32_t> triangles;
+    for (int axis = 0; axis < 3; ++axis)
+        for (const float sign : {-1.0f, 1.0f}) {
+            const std::uint32_t v = static_cast<std::uint32_t>(corners.size());
+            for (int k = 0; k < 4; ++k) {
+                float c[3];
+                c[axis] = sign;
+                c[(axis + 1) % 3] = k & 1 ? 1.0f : -1.0f;
+                c[(axis + 2) % 3] = k & 2 ? 1.0f : -1.0f;
+                corners.emplace_back(c[0], c[1], c[2]);
+                normals.emplace_back(axis == 0 ? sign : 0.0f, axis == 1 ? sign : 0.0f, axis == 2 ? sign : 0.0f);
+            }
+            const std::vector<std::uint32_t> face = sign > 0 ? std::vector<std::uint32_t>{v, v + 1, v + 3, v, v + 3, v + 2}
+                                                             : std::vector<std::uint32_t>{v, v + 3, v + 1, v, v + 2, v + 3};
+            triangles.insert(triangles.end(), face.begin(), face.end());
+        }
+    builder.setVertices(corners).setTriangles(triangles).setNormals(normals);
+    const RCShdPtr<const SdMesh> box = builder.build();
     int clipped = 0;
     for (int trial = 0; trial < 4; ++trial) {
         // In two trials the far plane cuts the box as well.
         const GeProjectiveMatrix3<double> projection = perspective(1.2, 0.5, trial < 2 ? 50.0 : 2.5);
-        const ProbeMaterial::Settings settings = counting(trial % 2 ? 0x02u : 0x40u);
+        // Seen from inside every face is a back face, drawn with its normal turned to the eye: a
+        // fragment counts only when it is.
+        ProbeMaterial::Settings settings = counting(trial % 2 ? 0x03u : 0x41u);
+        settings.probe = [](const RsShadingContext& c) {
+            const bool facing = c._normal.dot(GeVector3<float>(c._eyeCoord.x, c._eyeCoord.y, c._eyeCoord.z)) < 0.0f;
+            return facing ? Rgba(1, 1, 1, 1) : Rgba(0, 0, 0, 1);
+        };
         // Local to camera: scale by 2, turn about z (roll) and y (yaw), then move so that the eye
         // sits at local point e: near the back wall, with the box ahead, and so close to the
         // side wall x = -1 that rays turned towards it meet it within the near limit.
@@ -132,7 +161,9 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
         const GeAffineMatrix3<float> toCamera{float(m[0][0]), float(m[0][1]), float(m[0][2]), float(t[0]),  //
                                               float(m[1][0]), float(m[1][1]), float(m[1][2]), float(t[1]),  //
                                               float(m[2][0]), float(m[2][1]), float(m[2][2]), float(t[2])};
-        const RCShdPtr<RsScene> scene = makeScene({makeInstance(box, settings, toCamera)});
+        const RCShdPtr<RsGeomInstance> instance = makeInstance(box, settings, toCamera);
+        instance->_drawFrontFaces = false;
+        const RCShdPtr<RsScene> scene = makeScene({instance});
         Picture picture(rect);
         render(scene, projection, rect, picture);
 
