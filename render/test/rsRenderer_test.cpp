@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <random>
+#include <sstream>
 
 #include "exBase.h"
 #include "rsRenderTestSupport.h"
@@ -195,8 +196,9 @@ TEST(RsRenderer, CameraInstancesAndFailures) {
         makeScene({makeInstance(makeMesh({{-1, -1, -3}, {1, -1, -3}, {0, 1, -3}}, {0, 1, 2}), ProbeMaterial::Settings{})});
     const Rgba untouched(0.25f, 0.5f, 0.75f, 1.0f);
     RsRenderer renderer;
-    EXPECT_FALSE(renderer.getAntialiasing());
-    EXPECT_TRUE(renderer.getZBuffer());
+    std::ostringstream printed;
+    renderer.dump(printed);
+    EXPECT_EQ(printed.str().rfind(" _antialiasing: 0 _zBuffer: 1 _filterKernel:", 0), 0u) << printed.str();
     EXPECT_EQ(renderer.getFilterKernelType(), 0);
 
     // A camera placed by its instance: the same picture as its inverse matrix and projection.

@@ -83,6 +83,15 @@ void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatr
     renderWithFactory(factory, scene, _zBuffer, worldToCamera, projection, rectangle);
 }
 
+void RsRenderer::dump(std::ostream& os) const {
+    os << " _antialiasing: " << _antialiasing << " _zBuffer: " << _zBuffer << " _filterKernel:";
+    _filterKernel.dump(os);
+    os << " _fillColor:";
+    _fillColor.dump(os);
+    os << " _background:";
+    _background.dump(os);
+}
+
 unsigned int RsRenderer::getMemUsageMb() const {
     Assertions::throwProgramAborted(kSourcePath, 397, nullptr);
 }

@@ -8,6 +8,8 @@
 // A call draws the complete picture of its rectangle into the output guard's region and keeps
 // nothing afterwards: the buffer factory, the scene renderer and the list of visible instances
 // live on the call's stack. Settings take effect at the next call.
+#include <ostream>
+
 #include "coRgbaColorTyped.h"
 #include "geAffineMatrix3.h"
 #include "geProjectiveMatrix3.h"
@@ -60,6 +62,8 @@ public:
     // Not available: both abort.
     unsigned int getMemUsageMb() const;
     unsigned int getTileMemUsageMb() const;
+
+    void dump(std::ostream& os) const;
 
 protected:
     // The core of every render: accumulate and weight go to the output of the buffers (add the

@@ -8,6 +8,7 @@
 // that its filter footprint reads. One region's buffer exists at a time: it is created, every
 // instance of the list is drawn into it, it is finalised into the output and released before the
 // next region starts.
+#include <ostream>
 #include <utility>
 #include <vector>
 
@@ -79,6 +80,18 @@ public:
     const GeProjectiveMatrix3<float>& getPixelMatrix() const { return _pixelMatrix; }
     const GeAffineMatrix3<float>& getWorldToCamera() const { return _worldToCamera; }
     bool isOrthographic() const { return _orthographic; }
+
+    void dump(std::ostream& os) const {
+        os << " _factory: " << static_cast<const void*>(_factory) << " _region:";
+        _region.dump(os);
+        os << " _projection:";
+        _projection.dump(os);
+        os << " _pixelMatrix:";
+        _pixelMatrix.dump(os);
+        os << " _worldToCamera:";
+        _worldToCamera.dump(os);
+        os << " _orthographic: " << _orthographic;
+    }
 
 private:
     void renderLeaf(const RsGeomInstanceList& instances, const GeRectangle<int>& region) {
