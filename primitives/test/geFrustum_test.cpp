@@ -125,6 +125,7 @@ TEST(GeFrustumTest, ClassifyMatchesCornerTestsInClipSpace) {
         const auto projection = rnd.projection(kind);
         const Frustum frustum(projection);
         EXPECT_EQ(frustum.isOrthographic(), kind == 2);
+        for (int i = 0; i < Frustum::PLANE_COUNT; ++i) EXPECT_NEAR(frustum.getPlane(i).normal.length(), 1.0, 1e-12);
         for (int b = 0; b < 100; ++b) {
             const auto box = rnd.box(projection);
             for (unsigned int planeCount : {4U, 5U, 6U}) {
@@ -148,58 +149,6 @@ TEST(GeFrustumTest, ClassifyMatchesCornerTestsInClipSpace) {
     EXPECT_GT(counts[Frustum::OUTSIDE], 1000);
     EXPECT_GT(counts[Frustum::INTERSECTING], 1000);
     EXPECT_EQ(bitsSeen, 0x3fU);
-}
-
-TEST(GeFrustumTest, KnownBoxesAgainstASimplePerspective) {
-    // 90 degrees, aspect 1, near 1, far 100: the volume is |x|, |y| <= -z, 1 <= -z <= 100.
-    const Frustum frustum(GeCameraBuilder<double>::makePerspective(std::acos(0.0), 1, 100, 1));
-    struct Case {
-        GePoint3<double> min, max;
-        unsigned int classification, mask;
-    };
-    const Case cases[] = {
-        {{-1, -1, -20}, {1, 1, -10}, Frustum::INSIDE, 0},
-        {{-1, -1, -0.5}, {1, 1, -0.2}, Frustum::OUTSIDE, 0x0f},   // in front of the near plane
-        {{-0.2, -0.2, -5}, {0.2, 0.2, -0.5}, Frustum::INTERSECTING, 0x10},
-        {{-1, -1, -150}, {1, 1, -50}, Frustum::INTERSECTING, 0x20},
-        {{-1, -1, -150}, {1, 1, -0.5}, Frustum::INTERSECTING, 0x3f},
-        {{8, -1, -10}, {12, 1, -9}, Frustum::INTERSECTING, 0x02},  // over the x maximum side
-        {{-12, -1, -10}, {-8, 1, -9}, Frustum::INTERSECTING, 0x01},
-        {{-1, 8, -10}, {1, 12, -9}, Frustum::INTERSECTING, 0x08},
-        {{-1, -12, -10}, {1, -8, -9}, Frustum::INTERSECTING, 0x04},
-        {{20, -1, -10}, {30, 1, -9}, Frustum::OUTSIDE, 0},
-        {{-0.5, -0.5, 1}, {0.5, 0.5, 2}, Frustum::OUTSIDE, 0},      // behind the camera
-    };
-    for (const Case& c : cases) {
-        unsigned int mask = 0;
-        EXPECT_EQ(frustum.classify(GeAlignedBox3<double>(c.min, c.max), mask, 6), c.classification) << c.min << c.max;
-        EXPECT_EQ(mask, c.mask) << c.min << c.max;
-    }
-    // With four planes, near and far play no part.
-    unsigned int mask = 0;
-    EXPECT_EQ(frustum.classify(GeAlignedBox3<double>({-1, -1, -150}, {1, 1, -50}), mask, 4), Frustum::INSIDE);
-    EXPECT_EQ(mask, 0U);
-}
-
-TEST(GeFrustumTest, PlanesAreUnitLengthAndHoldTheVolumeInside) {
-    RandomScenes rnd(62);
-    for (int scene = 0; scene < 60; ++scene) {
-        const auto projection = rnd.projection(scene % 3);
-        const Frustum frustum(projection);
-        const auto inverse = projection.computeInverse();
-        for (int i = 0; i < Frustum::PLANE_COUNT; ++i) {
-            EXPECT_NEAR(frustum.getPlane(i).normal.length(), 1.0, 1e-12);
-        }
-        // The centre of NDC space is inside every plane by a margin.
-        const auto centre = inverse.transform(GeHomogeneousCoord3<double>(0, 0, 0, 1)).project();
-        for (int i = 0; i < Frustum::PLANE_COUNT; ++i) EXPECT_GT(frustum.getPlane(i).evaluate(centre), 0.0);
-    }
-    EXPECT_EQ(Frustum::getPlaneBit(Frustum::X_MIN_PLANE), 0x01U);
-    EXPECT_EQ(Frustum::getPlaneBit(1), 0x04U);
-    EXPECT_EQ(Frustum::getPlaneBit(2), 0x02U);
-    EXPECT_EQ(Frustum::getPlaneBit(3), 0x08U);
-    EXPECT_EQ(Frustum::getPlaneBit(Frustum::NEAR_PLANE), 0x10U);
-    EXPECT_EQ(Frustum::getPlaneBit(Frustum::FAR_PLANE), 0x20U);
 }
 
 }  // namespace

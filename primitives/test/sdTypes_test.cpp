@@ -1,12 +1,10 @@
-// The run-time types of the scene description classes, the casts the renderer relies on, and
-// the failure types of the library.
+// The run-time types of the scene description classes and the casts the renderer relies on.
 #include <gtest/gtest.h>
 
-#include <string>
 #include <vector>
 
+#include "exBase.h"
 #include "sdCamera.h"
-#include "sdEx.h"
 #include "sdMaterial.h"
 #include "sdMeshBuilder.h"
 #include "sdMeshGeometry.h"
@@ -77,46 +75,6 @@ TEST(SdTypes, TypesAreTypedByTheirHierarchy) {
     RCShdPtr<const SdObject> object = light;
     EXPECT_EQ(&RttiType<SdObject>::cast(object->getType()), &stdLight);
     EXPECT_THROW(RttiType<SdMaterial>::cast(object->getType()), ExCastFailed);
-}
-
-TEST(SdTypes, ObjectsCastToWhatTheyAre) {
-    RCShdPtr<SdObject> objects[] = {makeShared<SdStdLight>(), makeShared<SdCamera>(), makeShared<SdMeshGeometry>()};
-    EXPECT_FALSE(dynamicPointerCast<SdLight>(objects[0]).isNull());
-    EXPECT_TRUE(dynamicPointerCast<SdCamera>(objects[0]).isNull());
-    EXPECT_FALSE(dynamicPointerCast<const SdCamera>(RCShdPtr<const SdObject>(objects[1])).isNull());
-    EXPECT_FALSE(dynamicPointerCast<SdGeometry>(objects[2]).isNull());
-    EXPECT_TRUE(dynamicPointerCast<SdLight>(objects[2]).isNull());
-}
-
-TEST(SdTypes, TransferModesKeepTheirNumbers) {
-    using Mode = SdMaterial::TransferMode;
-    const Mode modes[] = {Mode::normal,     Mode::lumapremul, Mode::dissolve,  Mode::add,
-                          Mode::subtract,   Mode::multiply,   Mode::spotlight, Mode::spotlightBlend,
-                          Mode::screen,     Mode::overlay,    Mode::softlight, Mode::hardlight,
-                          Mode::darken,     Mode::lighten,    Mode::difference, Mode::exclusion,
-                          Mode::hue,        Mode::saturation, Mode::color,     Mode::luminance};
-    static_assert(sizeof(modes) / sizeof(modes[0]) == SdMaterial::transferModeCount);
-    static_assert(sizeof(Mode) == 4);
-    for (int i = 0; i < SdMaterial::transferModeCount; ++i) EXPECT_EQ(static_cast<int>(modes[i]), i);
-    EXPECT_EQ(SdMaterial()._transferMode, Mode::normal);
-}
-
-TEST(SdEx, FailuresCarryTheirPlaceAndMessage) {
-    try {
-        throw SdEx::ExCantResolveBuilder(".\\primitives/sdSceneRegistry.imp", 107, "Zr::SdCamera");
-    } catch (const ExBase& e) {
-        EXPECT_NE(dynamic_cast<const SdEx::ExCantResolveBuilder*>(&e), nullptr);
-        EXPECT_EQ(e.getFile(), ".\\primitives/sdSceneRegistry.imp");
-        EXPECT_EQ(e.getLine(), 107);
-        EXPECT_EQ(e.getMessage(), "Zr::SdCamera");
-    }
-    try {
-        throw SdEx::ExDoubleRegistration("f", 74, "Zr::SdMaterial");
-    } catch (const ExBase& e) {
-        EXPECT_EQ(dynamic_cast<const SdEx::ExCantResolveBuilder*>(&e), nullptr);
-        EXPECT_NE(std::string(e.what()).find("Zr::SdMaterial"), std::string::npos);
-        EXPECT_EQ(e.getLine(), 74);
-    }
 }
 
 }  // namespace

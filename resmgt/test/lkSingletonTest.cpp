@@ -6,7 +6,6 @@
 #include <cstdio>
 #include <latch>
 #include <new>
-#include <string>
 #include <thread>
 #include <vector>
 
@@ -14,14 +13,12 @@
 
 namespace Zr {
 
-// Lets the tests put a singleton back to its first state, and into states that only a fault
-// could produce.
+// Lets the tests put a singleton back to its first state, and into states only a fault produces.
 template <class T>
 struct LkSingletonTestPeer {
     static void setState(int state) { LkSingleton<T>::_state.store(state); }
     static void setPointee(T* p) { LkSingleton<T>::_pointee = p; }
     static LkLock* getInitLock() { return LkSingleton<T>::_initLock.load(); }
-    // Back to UNINITIALIZED with no object and no init lock, as at load time.
     static void restart() {
         delete LkSingleton<T>::_initLock.exchange(nullptr);
         LkSingleton<T>::_pointee = nullptr;
@@ -32,12 +29,9 @@ struct LkSingletonTestPeer {
 namespace Testing {
 namespace {
 
-const char* const impPath = ".\\resmgt/lkSingleton.imp";
-
 // Counts constructions and destructions; the constructor yields so that racing threads overlap.
 struct RaceObject {
-    static inline std::atomic<int> made{0};
-    static inline std::atomic<int> deleted{0};
+    static inline std::atomic<int> made{0}, deleted{0};
     RaceObject() {
         ++made;
         for (int i = 0; i < 20; ++i) std::this_thread::yield();
@@ -45,18 +39,15 @@ struct RaceObject {
     ~RaceObject() { ++deleted; }
 };
 
-using RacePeer = LkSingletonTestPeer<RaceObject>;
-
 TEST(LkSingletonTest, ThreadsRacingTheFirstDemandMakeOneObjectAndKeepOneLock) {
-    // Make the destroyer's lock once, so that it does not count in the rounds below.
-    LkSingletonDestroyer<RaceObject>::destroy();
+    using Peer = LkSingletonTestPeer<RaceObject>;
+    LkSingletonDestroyer<RaceObject>::destroy();  // makes the destroyer's own lock before counting
     constexpr int threadCount = 8;
     for (int round = 0; round < 30; ++round) {
-        RacePeer::restart();
+        Peer::restart();
         RaceObject::made = 0;
         RaceObject::deleted = 0;
         const int locksBefore = LkLockWindows::getLiveCount();
-
         std::latch start(threadCount);
         std::vector<RaceObject*> seen(threadCount, nullptr);
         std::vector<std::thread> threads;
@@ -67,51 +58,42 @@ TEST(LkSingletonTest, ThreadsRacingTheFirstDemandMakeOneObjectAndKeepOneLock) {
             });
         }
         for (std::thread& t : threads) t.join();
-
         EXPECT_EQ(RaceObject::made.load(), 1) << "round " << round;
         ASSERT_NE(seen[0], nullptr);
         for (RaceObject* p : seen) EXPECT_EQ(p, seen[0]) << "round " << round;
         EXPECT_EQ(LkLockWindows::getLiveCount(), locksBefore + 1) << "round " << round;
-        ASSERT_NE(RacePeer::getInitLock(), nullptr);
-        EXPECT_STREQ(RacePeer::getInitLock()->getName(), "LkSingleton init lock");
-        EXPECT_EQ(LkSingleton<RaceObject>::getState(), LkSingletonBase::INITIALIZED);
-
+        ASSERT_NE(Peer::getInitLock(), nullptr);
+        EXPECT_STREQ(Peer::getInitLock()->getName(), "LkSingleton init lock");
         LkSingletonDestroyer<RaceObject>::destroy();
         EXPECT_EQ(RaceObject::deleted.load(), 1) << "round " << round;
     }
 }
 
 struct LifeProbe {
-    static inline int made = 0;
-    static inline int deleted = 0;
+    static inline int made = 0, deleted = 0;
     LifeProbe() { ++made; }
     ~LifeProbe() { ++deleted; }
 };
 
-// The whole life of one singleton: every state, what each operation does there, and the
-// invariants holding in each.
+// The whole life of one singleton: each state, its name, its invariants, and what each
+// operation does there. Destroyed stays destroyed: no new object, no failure.
 TEST(LkSingletonTest, LifeRunsThroughTheThreeStatesAndEndsWithNull) {
     using S = LkSingleton<LifeProbe>;
-    EXPECT_EQ(S::getState(), LkSingletonBase::UNINITIALIZED);
-    EXPECT_STREQ(S::getStateName(), "UNINITIALIZED");
-    EXPECT_NO_THROW(S::checkClassInvariants());
-
+    const auto expectState = [](int state, const char* name) {
+        EXPECT_EQ(S::getState(), state);
+        EXPECT_STREQ(S::getStateName(), name);
+        EXPECT_NO_THROW(S::checkClassInvariants());
+    };
+    expectState(LkSingletonBase::UNINITIALIZED, "UNINITIALIZED");
     LifeProbe* first = S::getInstance();
     ASSERT_NE(first, nullptr);
     EXPECT_EQ(S::getInstance(), first);
     S::initSingleton();
     EXPECT_EQ(LifeProbe::made, 1);
-    EXPECT_EQ(S::getState(), LkSingletonBase::INITIALIZED);
-    EXPECT_STREQ(S::getStateName(), "INITIALIZED");
-    EXPECT_NO_THROW(S::checkClassInvariants());
-
+    expectState(LkSingletonBase::INITIALIZED, "INITIALIZED");
     LkSingletonDestroyer<LifeProbe>::destroy();
     EXPECT_EQ(LifeProbe::deleted, 1);
-    EXPECT_EQ(S::getState(), LkSingletonBase::DESTROYED);
-    EXPECT_STREQ(S::getStateName(), "DESTROYED");
-    EXPECT_NO_THROW(S::checkClassInvariants());
-
-    // Destroyed stays destroyed: no new object, no failure.
+    expectState(LkSingletonBase::DESTROYED, "DESTROYED");
     LifeProbe* late = reinterpret_cast<LifeProbe*>(1);
     EXPECT_NO_THROW(late = S::getInstance());
     EXPECT_EQ(late, nullptr);
@@ -121,16 +103,13 @@ TEST(LkSingletonTest, LifeRunsThroughTheThreeStatesAndEndsWithNull) {
     EXPECT_EQ(LifeProbe::deleted, 1);
 }
 
-struct InvariantProbe {};
-using InvariantPeer = LkSingletonTestPeer<InvariantProbe>;
-
 template <class Ex>
 void expectFailure(void (*operation)(), int line, const char* text) {
     try {
         operation();
         ADD_FAILURE() << "no exception for line " << line;
     } catch (const Ex& e) {
-        EXPECT_EQ(e.getFile(), impPath);
+        EXPECT_EQ(e.getFile(), ".\\resmgt/lkSingleton.imp");
         EXPECT_EQ(e.getLine(), line);
         if (text) {
             EXPECT_EQ(e.getMessage(), text);
@@ -138,41 +117,42 @@ void expectFailure(void (*operation)(), int line, const char* text) {
     }
 }
 
+struct InvariantProbe {};
+
 // States that only a fault could produce are reported with the source place and condition.
 TEST(LkSingletonTest, ClassInvariantsReportEachBrokenState) {
+    using Peer = LkSingletonTestPeer<InvariantProbe>;
+    using S = LkSingleton<InvariantProbe>;
     InvariantProbe object;
     struct Case {
         int state;
         InvariantProbe* pointee;
         int line;
         const char* text;
-        bool aborted;
     };
     const Case cases[] = {
-        {LkSingletonBase::UNINITIALIZED, &object, 214, "_pointee == 0", false},
-        {LkSingletonBase::INITIALIZED, nullptr, 218, "_pointee != 0", false},
-        {LkSingletonBase::DESTROYED, &object, 222, "_pointee == 0", false},
-        {3, nullptr, 226, nullptr, true},
-        {-1, &object, 226, nullptr, true},
+        {LkSingletonBase::UNINITIALIZED, &object, 214, "_pointee == 0"},
+        {LkSingletonBase::INITIALIZED, nullptr, 218, "_pointee != 0"},
+        {LkSingletonBase::DESTROYED, &object, 222, "_pointee == 0"},
+        {3, nullptr, 226, nullptr},  // no state at all: the program is aborted
+        {-1, &object, 226, nullptr},
     };
     for (const Case& c : cases) {
-        InvariantPeer::setState(c.state);
-        InvariantPeer::setPointee(c.pointee);
-        if (c.aborted) {
-            expectFailure<ExProgramAborted>(&LkSingleton<InvariantProbe>::checkClassInvariants, c.line,
-                                            c.text);
-            expectFailure<ExProgramAborted>(
-                [] { (void)LkSingleton<InvariantProbe>::getStateName(); }, 199, nullptr);
+        Peer::setState(c.state);
+        Peer::setPointee(c.pointee);
+        if (c.text) {
+            expectFailure<ExAssertionFailed>(&S::checkClassInvariants, c.line, c.text);
         } else {
-            expectFailure<ExAssertionFailed>(&LkSingleton<InvariantProbe>::checkClassInvariants,
-                                             c.line, c.text);
+            expectFailure<ExProgramAborted>(&S::checkClassInvariants, c.line, nullptr);
+            expectFailure<ExProgramAborted>([] { (void)S::getStateName(); }, 199, nullptr);
         }
     }
-    InvariantPeer::restart();
-    EXPECT_NO_THROW(LkSingleton<InvariantProbe>::checkClassInvariants());
+    Peer::restart();
+    EXPECT_NO_THROW(S::checkClassInvariants());
 }
 
-// Allocation that gives nothing is reported, and leaves the singleton free to try again.
+// Allocation that gives nothing is reported, and leaves the singleton uninitialized with its lock
+// released, free to try again.
 struct NoMemoryObject {
     static void* operator new(std::size_t, const std::nothrow_t&) noexcept { return nullptr; }
     static void operator delete(void* p) noexcept { ::operator delete(p); }
@@ -180,30 +160,15 @@ struct NoMemoryObject {
 
 TEST(LkSingletonTest, AllocationGivingNothingIsAnAssertionAndReleasesTheLock) {
     for (int attempt = 0; attempt < 2; ++attempt) {
-        expectFailure<ExAssertionFailed>([] { (void)LkSingleton<NoMemoryObject>::getInstance(); },
-                                         128, "pointee");
+        expectFailure<ExAssertionFailed>([] { (void)LkSingleton<NoMemoryObject>::getInstance(); }, 128,
+                                         "pointee");
         EXPECT_EQ(LkSingleton<NoMemoryObject>::getState(), LkSingletonBase::UNINITIALIZED);
     }
     EXPECT_NO_THROW(LkSingleton<NoMemoryObject>::checkClassInvariants());
 }
 
-struct FailsOnce {
-    static inline int attempts = 0;
-    FailsOnce() {
-        if (++attempts == 1) throw std::runtime_error("first construction fails");
-    }
-};
-
-TEST(LkSingletonTest, AConstructorFailurePassesThroughAndALaterDemandSucceeds) {
-    EXPECT_THROW(LkSingleton<FailsOnce>::getInstance(), std::runtime_error);
-    EXPECT_EQ(LkSingleton<FailsOnce>::getState(), LkSingletonBase::UNINITIALIZED);
-    EXPECT_NE(LkSingleton<FailsOnce>::getInstance(), nullptr);
-    EXPECT_EQ(FailsOnce::attempts, 2);
-    LkSingletonDestroyer<FailsOnce>::destroy();
-}
-
-// At process exit the destroyer ends each singleton, the later-made first, so that a singleton
-// that used another while being built can still use it while being destroyed.
+// At exit the later-made singleton ends first, so one that used another while being built can
+// still use it while being destroyed.
 struct InnerAtExit {
     ~InnerAtExit() { std::fputs("inner destroyed\n", stderr); }
 };
@@ -211,8 +176,7 @@ struct OuterAtExit {
     OuterAtExit() { (void)LkSingleton<InnerAtExit>::getInstance(); }
     ~OuterAtExit() {
         const bool innerAlive = LkSingleton<InnerAtExit>::getInstance() != nullptr;
-        std::fputs(innerAlive ? "outer destroyed, inner alive\n" : "outer destroyed, inner gone\n",
-                   stderr);
+        std::fputs(innerAlive ? "outer destroyed, inner alive\n" : "outer destroyed, inner gone\n", stderr);
     }
 };
 
