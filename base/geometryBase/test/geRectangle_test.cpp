@@ -16,11 +16,7 @@ int countPixels(const GeRectangle<int>& r) {
 }
 
 TEST(GeRectangleTest, MembersAreInTheOrderX0X1Y0Y1AndHalfOpen) {
-    const GeRectangle<int> r(2, 10, -3, 4);
-    EXPECT_EQ(r.x0, 2);
-    EXPECT_EQ(r.x1, 10);
-    EXPECT_EQ(r.y0, -3);
-    EXPECT_EQ(r.y1, 4);
+    const GeRectangle<int> r{2, 10, -3, 4};
     EXPECT_EQ(r.getWidth(), 8);
     EXPECT_EQ(r.getHeight(), 7);
     EXPECT_TRUE(r.contains(2, -3));

@@ -52,12 +52,6 @@ TEST(InPackageRegistryTest, PackagesAndDependenciesReadBackInTheOrderGiven) {
     EXPECT_EQ(record->getDependencyNames(),
               (std::vector<std::string>{"resmgt", "test.beta", "test.table",
                                         typeid(UnclaimedTag).name(), "base"}));
-    using Kind = InDependencyRecord::Kind;
-    const std::vector<Kind> kinds = {Kind::TAG, Kind::TAG, Kind::VARIABLE, Kind::TAG, Kind::TAG};
-    ASSERT_EQ(record->dependencies.size(), kinds.size());
-    for (std::size_t i = 0; i < kinds.size(); ++i) EXPECT_EQ(record->dependencies[i].kind, kinds[i]);
-    EXPECT_EQ(record->dependencies[0].typeName, typeid(ZrInit::resmgt).name());
-    EXPECT_EQ(record->dependencies[2].typeName, "");
 
     EXPECT_FALSE(InPackageRegistry::findPackage("test.nobody").has_value());
 }

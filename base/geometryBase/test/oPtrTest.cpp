@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "countingObjects.h"
-#include "exBase.h"
 
 namespace Zr::Testing {
 namespace {
@@ -66,13 +65,6 @@ TEST(OPtrTest, ConvertsToABaseAndDeletesThroughTheVirtualDestructor) {
         EXPECT_EQ(constBase->getId(), 8);
     }
     EXPECT_EQ(counts.deleted, 1);
-}
-
-TEST(OPtrTest, DereferencingAnEmptyPointerThrowsExNullPtr) {
-    OPtr<CountedShared> empty;
-    EXPECT_TRUE(empty == nullptr);
-    EXPECT_THROW((void)empty->getId(), ExNullPtr);
-    EXPECT_THROW((void)*empty, ExNullPtr);
 }
 
 }  // namespace

@@ -9,6 +9,8 @@
 
 #include "countingObjects.h"
 #include "exBase.h"
+#include "oPtr.h"
+#include "rcStrongPtr.h"
 
 namespace Zr::Testing {
 namespace {
@@ -16,6 +18,7 @@ namespace {
 // Random copies, moves, resets, self-assignments and swaps over a few pointer slots, checked
 // against a model of which object each slot holds: every object's count must equal the number of
 // slots holding it, and an object must be deleted exactly when no slot holds it any more.
+// Self-assignment, self-move and resetting to the object held are among the operations.
 TEST(RCShdPtrTest, CountsFollowAModelOfOwnershipOverRandomOperations) {
     for (unsigned seed = 1; seed <= 20; ++seed) {
         LifeCounts counts;
@@ -84,18 +87,6 @@ TEST(RCShdPtrTest, CountsFollowAModelOfOwnershipOverRandomOperations) {
     }
 }
 
-TEST(RCShdPtrTest, SelfAssignmentOfTheOnlyOwnerKeepsTheObject) {
-    LifeCounts counts;
-    RCShdPtr<CountedShared> p = makeShared<CountedShared>(counts, 7);
-    RCShdPtr<CountedShared>& alias = p;
-    p = alias;
-    p = std::move(alias);
-    EXPECT_EQ(counts.deleted, 0);
-    ASSERT_FALSE(p.isNull());
-    EXPECT_EQ(p->getId(), 7);
-    EXPECT_EQ(p->getReferenceCount(), 1);
-}
-
 // A chain where each link owns the next: assigning p = p->next drops the only owner of the old
 // head while the new value is reachable only through it. The new reference must be taken first.
 class Link : public RCObject {
@@ -150,19 +141,27 @@ TEST(RCShdPtrTest, DynamicCastGivesTheObjectOrEmpty) {
     EXPECT_EQ(plain->getReferenceCount(), 1);
 }
 
-TEST(RCShdPtrTest, DereferencingAnEmptyPointerThrowsExNullPtrNamingTheType) {
+// For the shared, strong and owning pointers alike.
+TEST(PointerTest, DereferencingAnEmptyPointerThrowsExNullPtr) {
     RCShdPtr<CountedShared> empty;
-    EXPECT_TRUE(empty.isNull());
     EXPECT_FALSE(static_cast<bool>(empty));
-    EXPECT_EQ(empty.get(), nullptr);
     try {
         (void)empty->getId();
         FAIL() << "no exception";
     } catch (const ExNullPtr& e) {
-        EXPECT_NE(e.getMessage().find(typeid(CountedShared).name()), std::string::npos);
+        EXPECT_NE(e.getMessage().find(typeid(CountedShared).name()), std::string::npos);  // names the type
     }
     EXPECT_THROW((void)*empty, ExNullPtr);
     EXPECT_THROW((void)*RCShdPtr<const CountedShared>(), ExBase);
+
+    RCStrongPtr<PlainBase> emptyStrong(static_cast<PlainBase*>(nullptr));
+    EXPECT_EQ(emptyStrong.getStrongCount(), 0);
+    EXPECT_THROW((void)emptyStrong->getId(), ExNullPtr);
+    EXPECT_THROW((void)*emptyStrong, ExNullPtr);
+    OPtr<CountedShared> emptyOwned;
+    EXPECT_TRUE(emptyOwned == nullptr);
+    EXPECT_THROW((void)emptyOwned->getId(), ExNullPtr);
+    EXPECT_THROW((void)*emptyOwned, ExNullPtr);
 }
 
 // Threads copy and drop references to one object; atomic counts leave it with exactly the

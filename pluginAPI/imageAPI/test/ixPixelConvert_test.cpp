@@ -108,6 +108,8 @@ TEST(IxPixelConvertHalf, FloatToHalfMatchesTheReferenceOverSampledFloats) {
     }
 }
 
+// The rules the reference encodes, pinned independently of it at a few points. (Floats that are
+// exactly halves are pinned by the exhaustive round trip above.)
 TEST(IxPixelConvertHalf, LandmarkValues) {
     struct Case {
         float value;
@@ -115,8 +117,7 @@ TEST(IxPixelConvertHalf, LandmarkValues) {
     };
     const float inf = std::numeric_limits<float>::infinity();
     const Case cases[] = {
-        {0.0f, 0x0000},  {-0.0f, 0x8000}, {1.0f, 0x3c00},       {-2.0f, 0xc000},
-        {65504.0f, 0x7bff}, {inf, 0x7bff},  {-inf, 0xfbff},       {std::ldexp(1.0f, -24), 0x0001},
+        {inf, 0x7bff}, {-inf, 0xfbff},  // saturation instead of infinity
         // 1 + 2^-11 lies half way between 1 and the next half: it rounds up, not to even.
         {1.0f + std::ldexp(1.0f, -11), 0x3c01},          {-(1.0f + std::ldexp(1.0f, -11)), 0xbc01},
         {1.0f + std::ldexp(1.0f, -11) - std::ldexp(1.0f, -23), 0x3c00},

@@ -44,8 +44,6 @@ TEST(IxPixelFormat, KnownCombinationsConstructAndTheRawFormatIsOneByte) {
     }
     const IxPixelFormat raw = IxPixelFormat::getRawMemoryFormat();
     EXPECT_EQ(raw, IxPixelFormat(IxPixelFormat::ALPHA, IxPixelFormat::UINT8, Rational{1, 1}, 0));
-    EXPECT_EQ(raw._aspectRatio.numerator, 1);
-    EXPECT_EQ(raw._aspectRatio.denominator, 1);
     EXPECT_EQ(raw.getBytesPerPixel(), 1);
 }
 
