@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <random>
+#include <string>
 
 #include "exBase.h"
 #include "rsRenderTestSupport.h"
@@ -187,6 +188,41 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
             }
     }
     EXPECT_GT(clipped, 1000);
+}
+
+// Lights are prepared on every call, in the scene's order and before any pixel is drawn, even in a
+// scene without instances, whose picture is then the fill colour.
+TEST(RsRenderer, LightsArePreparedOnEveryCallEvenWithoutInstances) {
+    struct OrderedLight : RsLightShader {
+        OrderedLight(std::vector<std::string>& log, std::string name) : _log(log), _name(std::move(name)) {}
+        void setupRender(const GeAffineMatrix3<float>& worldToCamera) override {
+            _log.push_back(_name + " setup");
+            _lastView = worldToCamera;
+        }
+        void initializeMaps(const RCShdPtr<RsScene>&) override { _log.push_back(_name + " maps"); }
+        std::vector<std::string>& _log;
+        std::string _name;
+        GeAffineMatrix3<float> _lastView;
+    };
+    std::vector<std::string> log;
+    RsScene::GeomInstanceList instances;
+    RsScene::LightList lights{makeShared<OrderedLight>(log, "a"), makeShared<OrderedLight>(log, "b")};
+    RsScene::CameraList cameras;
+    const RCShdPtr<RsScene> scene = makeShared<RsScene>(instances, lights, cameras);
+
+    const GeRectangle<int> rect{3, 9, -2, 5};
+    const Rgba fill(0.25f, 0.5f, 0.75f, 1.0f);
+    RsRenderer renderer;
+    renderer.setFillColor(fill);
+    const GeAffineMatrix3<float> view(1, 0, 0, 2, 0, 1, 0, 0, 0, 0, 1, -1);
+    Picture picture(rect, Rgba(0, 0, 0, 0));
+    for (int call = 0; call < 2; ++call)
+        renderer.render(view, perspective(1.0, 0.1, 10.0), scene, rect, picture.guard);
+
+    EXPECT_EQ(log, (std::vector<std::string>{"a setup", "a maps", "b setup", "b maps",
+                                              "a setup", "a maps", "b setup", "b maps"}));
+    EXPECT_FLOAT_EQ(static_cast<OrderedLight&>(*scene->_lights[1])._lastView(0, 3), 2.0f);
+    EXPECT_TRUE(picture == Picture(rect, fill));
 }
 
 TEST(RsRenderer, CameraInstancesAndFailures) {

@@ -19,8 +19,14 @@
 
 namespace Zr::SceneTest {
 
-// A light shader that only has to be owned.
-class TestLight : public RsLightShader {};
+// A light shader that only has to be owned; it counts the per-render calls it receives.
+class TestLight : public RsLightShader {
+public:
+    void setupRender(const GeAffineMatrix3<float>&) override { ++_setupCount; }
+    void initializeMaps(const RCShdPtr<RsScene>&) override { ++_mapCount; }
+    int _setupCount = 0;
+    int _mapCount = 0;
+};
 
 // A material shader that only has to be owned.
 class TestMaterial : public RsMaterialShader {

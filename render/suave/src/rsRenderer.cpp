@@ -14,14 +14,6 @@ namespace {
 
 const char* const kSourcePath = "render\\suave\\src\\rsRenderer";
 
-// Lights with per-render work build their view and their shadow maps here, before any pixel is
-// drawn, in the scene's order.
-template <class Light>
-void prepareLight(Light& light, const GeAffineMatrix3<float>& worldToCamera, RCShdPtr<RsScene>& scene) {
-    if constexpr (requires { light.setupRender(worldToCamera); }) light.setupRender(worldToCamera);
-    if constexpr (requires { light.initializeMaps(scene); }) light.initializeMaps(scene);
-}
-
 // Steps 2 to 7 of a render on the path of Factory, whose settings are made: the scene renderer
 // with its matrices, the lights, the culled instance list, and the region recursion over the
 // factory's pixel region. Locals go in the reverse order of their making: frustum, list, scene
@@ -33,9 +25,12 @@ void renderWithFactory(Factory& factory, const RCShdPtr<RsScene>& scene, bool zB
     RCStrongPtr<RsSceneRenderer<Factory>> sceneRenderer(new RsSceneRenderer<Factory>(factory));
     sceneRenderer->setup(worldToCamera, projection, rectangle);
 
-    RCShdPtr<RsScene> sceneRef = scene;
-    for (const RCShdPtr<RsLightShader>& light : sceneRef->_lights)
-        prepareLight(*light, sceneRenderer->getWorldToCamera(), sceneRef);
+    // Each light places itself for this call and rebuilds its shadow maps, in the scene's order,
+    // before any pixel is drawn.
+    for (const RCShdPtr<RsLightShader>& light : scene->_lights) {
+        light->setupRender(sceneRenderer->getWorldToCamera());
+        light->initializeMaps(scene);
+    }
 
     const GeRectangle<int> pixelRegion = factory.getPixelRegion();
     RsGeomInstanceList instances;
