@@ -16,6 +16,7 @@
 // indices 0 to 2 and new vertices are appended behind them.
 #include <vector>
 
+#include "geHomogeneousCoord3.h"
 #include "geRectangle.h"
 #include "rsVertexAttributes.h"
 
@@ -64,6 +65,18 @@ public:
         return getVertexCount();
     }
 
+    // True when the three positions of a triangle all lie strictly outside one active plane. Such
+    // a triangle clips to nothing, whatever the other planes do, so a caller can skip it before
+    // building its vertices: most faces of a mesh lie wholly outside most regions.
+    bool isOutside(const GeHomogeneousCoord3<double>& a, const GeHomogeneousCoord3<double>& b,
+                   const GeHomogeneousCoord3<double>& c) const {
+        for (unsigned int bit = 1; bit <= allPlanes; bit <<= 1) {
+            if ((_clipFlags & bit) != 0 && valueOf(a, bit) < 0.0 && valueOf(b, bit) < 0.0 && valueOf(c, bit) < 0.0)
+                return true;
+        }
+        return false;
+    }
+
     int getVertexCount() const { return static_cast<int>(_polygon.size()); }
     // Vertex i of the polygon, in order around it.
     Vertex& getVertex(int i) { return _vertices[static_cast<std::size_t>(_polygon[static_cast<std::size_t>(i)])]; }
@@ -72,8 +85,8 @@ private:
     static constexpr std::size_t kInitialRoom = 20;
 
     // Value of v for the plane with the given bit: at least 0 inside.
-    double valueOf(const Vertex& v, unsigned int bit) const {
-        const GeHomogeneousCoord3<double>& p = v._pixCoord;
+    double valueOf(const Vertex& v, unsigned int bit) const { return valueOf(v._pixCoord, bit); }
+    double valueOf(const GeHomogeneousCoord3<double>& p, unsigned int bit) const {
         switch (bit) {
             case xMinBit: return p.x - _clipRegion[0] * p.w;
             case xMaxBit: return _clipRegion[1] * p.w - p.x;

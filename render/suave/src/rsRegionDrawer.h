@@ -196,6 +196,10 @@ private:
     void drawSolidFaces(unsigned int first, unsigned int end) {
         RsPolygonClipper<V>& clipper = clipperFor<V>();
         forEachFace(first, end, [&](const SdMesh::Face& face) {
+            if (clipper.isOutside(GeHomogeneousCoord3<double>(_pixelPositions[face.getVertexIndex(0)]),
+                                  GeHomogeneousCoord3<double>(_pixelPositions[face.getVertexIndex(1)]),
+                                  GeHomogeneousCoord3<double>(_pixelPositions[face.getVertexIndex(2)])))
+                return;
             V corners[3]{};
             if (!prepareFace(face, corners)) return;
             clipper.setTriangle(corners[0], corners[1], corners[2]);
