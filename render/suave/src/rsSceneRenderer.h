@@ -19,6 +19,7 @@
 #include "rcShdPtr.h"
 #include "rsCullAndSort.h"
 #include "rsGeomInstance.h"
+#include "rsInstanceVertices.h"
 #include "rsRegionDrawer.h"
 #include "rsShadingContext.h"
 
@@ -26,16 +27,8 @@ namespace Zr {
 
 template <class Factory>
 class RsSceneRenderer {
-    template <class P>
-    struct Pointee;
-    template <class T>
-    struct Pointee<RCShdPtr<T>> {
-        using type = T;
-    };
-
 public:
-    using Buffer = typename Pointee<decltype(std::declval<Factory&>().createBuffer(
-        std::declval<const GeRectangle<int>&>()))>::type;
+    using Buffer = typename Factory::Buffer;
 
     explicit RsSceneRenderer(Factory& factory) : _factory(&factory) {}
 
@@ -58,28 +51,18 @@ public:
         _orthographic = projection(3, 2) == 0.0;
     }
 
-    // Draws the instances into region, dividing it while its area exceeds the factory's limit.
+    // Draws the instances into region. Their vertex data is made once for the call; the region
+    // is then divided while its area exceeds the factory's limit.
     void renderRegion(const RsGeomInstanceList& instances, const GeRectangle<int>& region) {
-        const long long area = static_cast<long long>(region.x1 - region.x0) *
-                               static_cast<long long>(region.y1 - region.y0);
-        if (area <= _factory->getMaxArea()) {
-            renderLeaf(instances, region);
-            return;
-        }
-        const int k = _factory->getKernelSize();
-        const int mx = static_cast<int>((static_cast<double>(region.x0) + region.x1) * 0.5);
-        const int my = static_cast<int>((static_cast<double>(region.y0) + region.y1) * 0.5);
-        renderRegion(instances, GeRectangle<int>(region.x0, mx + k, region.y0, my + k));
-        renderRegion(instances, GeRectangle<int>(mx - k, region.x1, region.y0, my + k));
-        renderRegion(instances, GeRectangle<int>(region.x0, mx + k, my - k, region.y1));
-        renderRegion(instances, GeRectangle<int>(mx - k, region.x1, my - k, region.y1));
+        std::vector<RsInstanceVertices> vertices;
+        vertices.reserve(instances.size());
+        for (const RCShdPtr<RsGeomInstance>& instance : instances)
+            vertices.emplace_back(*instance, _pixelMatrix, true, needsTangents(*instance));
+        renderPieces(instances, vertices, region);
     }
 
-    const GeRectangle<int>& getRegion() const { return _region; }
     const GeProjectiveMatrix3<double>& getProjection() const { return _projection; }
-    const GeProjectiveMatrix3<float>& getPixelMatrix() const { return _pixelMatrix; }
     const GeAffineMatrix3<float>& getWorldToCamera() const { return _worldToCamera; }
-    bool isOrthographic() const { return _orthographic; }
 
     void dump(std::ostream& os) const {
         os << " _factory: " << static_cast<const void*>(_factory) << " _region:";
@@ -94,28 +77,53 @@ public:
     }
 
 private:
-    void renderLeaf(const RsGeomInstanceList& instances, const GeRectangle<int>& region) {
+    void renderPieces(const RsGeomInstanceList& instances, std::vector<RsInstanceVertices>& vertices,
+                      const GeRectangle<int>& region) {
+        const long long area = static_cast<long long>(region.x1 - region.x0) *
+                               static_cast<long long>(region.y1 - region.y0);
+        if (area <= _factory->getMaxArea()) {
+            renderLeaf(instances, vertices, region);
+            return;
+        }
+        const int k = _factory->getKernelSize();
+        const int mx = static_cast<int>((static_cast<double>(region.x0) + region.x1) * 0.5);
+        const int my = static_cast<int>((static_cast<double>(region.y0) + region.y1) * 0.5);
+        renderPieces(instances, vertices, GeRectangle<int>(region.x0, mx + k, region.y0, my + k));
+        renderPieces(instances, vertices, GeRectangle<int>(mx - k, region.x1, region.y0, my + k));
+        renderPieces(instances, vertices, GeRectangle<int>(region.x0, mx + k, my - k, region.y1));
+        renderPieces(instances, vertices, GeRectangle<int>(mx - k, region.x1, my - k, region.y1));
+    }
+
+    void renderLeaf(const RsGeomInstanceList& instances, std::vector<RsInstanceVertices>& vertices,
+                    const GeRectangle<int>& region) {
         RCShdPtr<Buffer> buffer = _factory->createBuffer(region);
         {
-            RsRegionDrawer<Buffer> drawer(buffer, &_pixelMatrix, region, _orthographic);
-            for (const RCShdPtr<RsGeomInstance>& instance : instances) drawInstance(drawer, *instance, instance);
+            RsRegionDrawer<Buffer> drawer(buffer, region, _orthographic);
+            for (std::size_t i = 0; i < instances.size(); ++i) drawInstance(drawer, *instances[i], vertices[i]);
             buffer->finalize();
         }
     }
 
+    // True when a material of the instance shades with a tangent frame.
+    static bool needsTangents(const RsGeomInstance& geom) {
+        const unsigned int groups = geom._mesh->getFaceGroupCount();
+        const RsGeomInstance::MaterialList& materials = geom._materials;
+        if (materials.empty()) return false;
+        for (unsigned int g = 0; g < groups; ++g)
+            if ((materials[g % materials.size()]->getNeededContext() & RsShadingContext::needsTangents) != 0)
+                return true;
+        return false;
+    }
+
     static void drawInstance(RsRegionDrawer<Buffer>& drawer, const RsGeomInstance& geom,
-                             const RCShdPtr<RsGeomInstance>& instance) {
+                             RsInstanceVertices& vertices) {
         const SdMesh& mesh = *geom._mesh;
         const unsigned int groups = mesh.getFaceGroupCount();
         const RsGeomInstance::MaterialList& materials = geom._materials;
         const std::size_t materialCount = materials.size();
         // Face group g takes material g modulo the count, which needs a material.
         ZR_ASSERT_AT(groups == 0 || materialCount != 0, "render\\suave\\src\\rsSceneRenderer", __LINE__);
-        bool withTangents = false;
-        for (unsigned int g = 0; g < groups && !withTangents; ++g)
-            withTangents = (materials[g % materialCount]->getNeededContext() &
-                            RsShadingContext::needsTangents) != 0;
-        drawer.setInstance(instance, true, withTangents, true);
+        drawer.setInstance(geom, vertices, true);
         for (unsigned int g = 0; g < groups; ++g) {
             const SdMeshTypes::FaceGroup& group = mesh.getFaceGroup(g);
             drawer.drawFaces(materials[g % materialCount], group._firstFace,
