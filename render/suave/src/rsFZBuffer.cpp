@@ -21,30 +21,57 @@ typename RsFZBuffer::Rasterizer<Vertex>::DrawSpan spanMethod(bool zBuffer) {
 
 }  // namespace
 
-RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply)
+RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply,
+                       RsFZBufferMemory* memory)
     : _x(x),
       _y(y),
       _width(width),
       _height(height),
       _unpremultiply(unpremultiply),
+      _memory(memory),
       _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer), getPixelRegion()),
       _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer), getPixelRegion()),
       _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer), getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
     const std::size_t pixels = getPixelCount();
-    // One fragment per pixel in the first chunk: a region without overlap needs no other.
-    _pool = std::make_unique<RsFragmentPool>(static_cast<std::int32_t>(pixels));
-    _pool->allocateChunk(pixels * sizeof(RsFragment));
-    _lists = std::make_unique<RsFragment*[]>(pixels);  // all null
+    if (memory != nullptr && memory->_pool) {
+        _pool = std::move(memory->_pool);
+        _pool->rewind(static_cast<std::int32_t>(pixels));
+    } else {
+        // One fragment per pixel in the first chunk: a region without overlap needs no other.
+        _pool = std::make_unique<RsFragmentPool>(static_cast<std::int32_t>(pixels));
+        _pool->allocateChunk(pixels * sizeof(RsFragment));
+    }
+    if (memory != nullptr && memory->_pixels >= pixels) {
+        _arrayPixels = memory->_pixels;
+        _lists = std::move(memory->_lists);
+        // Only the array of this buffer's mode: the other one's presence tells the mode.
+        if (zBuffer) _zBuffer = std::move(memory->_zBuffer);
+        else _closed = std::move(memory->_closed);
+    } else {
+        _arrayPixels = pixels;
+        _lists = std::make_unique_for_overwrite<RsFragment*[]>(pixels);
+    }
+    std::fill(_lists.get(), _lists.get() + pixels, nullptr);
     if (zBuffer) {
-        _zBuffer = std::make_unique_for_overwrite<double[]>(pixels);
+        if (!_zBuffer) _zBuffer = std::make_unique_for_overwrite<double[]>(_arrayPixels);
         std::fill(_zBuffer.get(), _zBuffer.get() + pixels, kEmptyDepth);
     } else {
-        _closed = std::make_unique<unsigned char[]>(pixels);  // all open
+        if (!_closed) _closed = std::make_unique_for_overwrite<unsigned char[]>(_arrayPixels);
+        std::fill(_closed.get(), _closed.get() + pixels, 0);  // all open
     }
 }
 
 RsFZBuffer::~RsFZBuffer() {
+    if (_memory != nullptr) {
+        // The arrays and the pool go back for the next region's buffer.
+        _memory->_pixels = _arrayPixels;
+        _memory->_lists = std::move(_lists);
+        _memory->_zBuffer = std::move(_zBuffer);
+        _memory->_closed = std::move(_closed);
+        _memory->_pool = std::move(_pool);
+        return;
+    }
     // The per-pixel arrays and the pool go first; the rasterizers and the guards follow as
     // members.
     _zBuffer.reset();
@@ -75,12 +102,11 @@ void RsFZBuffer::finalize() {
 }
 
 std::size_t RsFZBuffer::getMemorySize() const {
-    const std::size_t pixels = getPixelCount();
     std::size_t bytes = sizeof(RsFZBuffer);
     if (_pool) bytes += sizeof(RsFragmentPool) + _pool->getMemorySize();
-    if (_closed) bytes += pixels * sizeof(unsigned char);
-    if (_zBuffer) bytes += pixels * sizeof(double);
-    if (_lists) bytes += pixels * sizeof(RsFragment*);
+    if (_closed) bytes += _arrayPixels * sizeof(unsigned char);
+    if (_zBuffer) bytes += _arrayPixels * sizeof(double);
+    if (_lists) bytes += _arrayPixels * sizeof(RsFragment*);
     return bytes;
 }
 

@@ -16,7 +16,9 @@
 // float tolerance (RsTolerance::isOne).
 //
 // Fragments come from a pool of chunks that is never freed piecemeal; the first chunk holds one
-// fragment per pixel.
+// fragment per pixel. A buffer made with an RsFZBufferMemory takes its per-pixel arrays and pool
+// from it when they are large enough and gives them back when it dies, so that the regions of a
+// render, drawn one after the other, map their memory once.
 #include <cstddef>
 #include <memory>
 #include <ostream>
@@ -38,6 +40,15 @@ namespace Zr {
 
 class RsDeepShadowMap;
 
+// What a fragment buffer allocates, handed on from one buffer to the next.
+struct RsFZBufferMemory {
+    std::size_t _pixels = 0;  // the length of each per-pixel array
+    std::unique_ptr<unsigned char[]> _closed;
+    std::unique_ptr<double[]> _zBuffer;
+    std::unique_ptr<RsFragment*[]> _lists;
+    std::unique_ptr<RsFragmentPool> _pool;
+};
+
 class RsFZBuffer : public RCObject, public IxTileManip {
 public:
     using Rgba = CoRgbaColorTyped<float>;
@@ -51,8 +62,10 @@ public:
 
     // A buffer for the pixels x <= px < x + width, y <= py < y + height, with a Z-buffer when
     // zBuffer is set. unpremultiply is handed to the resolve. The fill colour starts as opaque
-    // black, the guards empty.
-    RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply);
+    // black, the guards empty. memory, when given, lends its arrays and pool and must outlive the
+    // buffer.
+    RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply,
+               RsFZBufferMemory* memory = nullptr);
     ~RsFZBuffer() override;
     RsFZBuffer(const RsFZBuffer&) = delete;
     RsFZBuffer& operator=(const RsFZBuffer&) = delete;
@@ -135,6 +148,8 @@ private:
     std::unique_ptr<RsFragment*[]> _lists;
     std::unique_ptr<RsFragmentPool> _pool;
     RsDeepShadowMap* _deepShadowMap = nullptr;
+    RsFZBufferMemory* _memory;
+    std::size_t _arrayPixels = 0;  // the length of the per-pixel arrays, at least the pixel count
     Rasterizer<RsTangentVertex> _rasterizerTangent;
     Rasterizer<RsPlainVertex> _rasterizerPlain;
     Rasterizer<RsNormalVertex> _rasterizerNormal;

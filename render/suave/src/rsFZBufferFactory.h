@@ -65,6 +65,8 @@ private:
     IxTileManip::ReadGuardNoCheck _background;
     RsDeepShadowMap* _deepShadowMap = nullptr;
     bool _unpremultiply = true;
+    // Handed from each region's buffer to the next; the buffers die before the factory.
+    mutable RsFZBufferMemory _memory;
 };
 
 }  // namespace Zr

@@ -36,11 +36,31 @@ void RsFragmentPool::startChunk(std::size_t bytes) {
     const IxTile tile(IxPixelFormat::getRawMemoryFormat(),
                       GeRectangle<int>(0, static_cast<int>(bytes), 0, 1), CoRgbaColorTyped<float>());
     _chunks.emplace_back(tile);
+    enterChunk(_chunks.size() - 1);
+}
+
+void RsFragmentPool::enterChunk(std::size_t index) {
+    _chunkIndex = index;
+    const IxTileManip::WriteGuardNoCheck& chunk = _chunks[index];
     // An empty tile has no base pointer: the chunk then hands out nothing.
-    unsigned char* begin = _chunks.back()._basePointer;
+    unsigned char* begin = chunk._basePointer;
+    const std::size_t bytes = begin == nullptr ? 0 : static_cast<std::size_t>(chunk._rectangle.getWidth());
     _current = begin;
     // Only whole fragments are handed out; a tail shorter than one stays unused.
     _end = begin + bytes / sizeof(RsFragment) * sizeof(RsFragment);
+}
+
+void RsFragmentPool::nextChunk() {
+    while (_current == _end) {
+        if (_chunkIndex + 1 < _chunks.size()) enterChunk(_chunkIndex + 1);
+        else startChunk(getGrowthBytes());
+    }
+}
+
+void RsFragmentPool::rewind(std::int32_t chunkFragments) {
+    setChunkFragments(chunkFragments);
+    if (_chunks.empty()) return;
+    enterChunk(0);
 }
 
 std::size_t RsFragmentPool::getMemorySize() const {

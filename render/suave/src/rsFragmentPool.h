@@ -27,7 +27,7 @@ public:
     // An uninitialised fragment. Takes a new chunk of getChunkFragments() fragments when the
     // current one is used up. Throws ExOutOfMemory when no chunk can be had.
     RsFragment* allocate() {
-        if (_current == _end) startChunk(getGrowthBytes());
+        if (_current == _end) nextChunk();
         RsFragment* fragment = reinterpret_cast<RsFragment*>(_current);
         _current += sizeof(RsFragment);
         return fragment;
@@ -37,6 +37,11 @@ public:
     // the previous chunk is not used any more. A chunk of less than one fragment is held but
     // hands out nothing.
     void allocateChunk(std::size_t bytes);
+
+    // Hands out the memory of every chunk again from the first one on, for a buffer that takes
+    // the pool over, and grows by chunkFragments when the chunks are used up. The fragments
+    // handed out before are dead from then on.
+    void rewind(std::int32_t chunkFragments);
 
     std::int32_t getChunkFragments() const { return _chunkFragments; }
     void setChunkFragments(std::int32_t chunkFragments);
@@ -53,6 +58,9 @@ public:
 
 private:
     void startChunk(std::size_t bytes);
+    // Moves on to the next chunk that holds a fragment, making one when none is left.
+    void nextChunk();
+    void enterChunk(std::size_t index);
     std::size_t getGrowthBytes() const {
         return static_cast<std::size_t>(_chunkFragments > 0 ? _chunkFragments : 1) * sizeof(RsFragment);
     }
@@ -61,6 +69,7 @@ private:
     std::vector<IxTileManip::WriteGuardNoCheck> _chunks;
     std::int32_t _chunkFragments;
     // The next free byte of the current chunk, and the end of the fragments that fit in it.
+    std::size_t _chunkIndex = 0;  // the chunk that _current and _end lie in
     unsigned char* _current = nullptr;
     unsigned char* _end = nullptr;
 };
