@@ -10,13 +10,22 @@ namespace Zr {
 
 namespace {
 
+constexpr const char* kSourceFile = ".\\pluginAPI/imageAPI/src/ixRowCodec.cpp";
 
-// One channel type each: its size in memory and its conversions. Loads and stores go through
-// memcpy, which compiles to plain moves and keeps the code free of alignment assumptions.
+using Rgba = IxRowCodec::Rgba;
+
+// One channel type each: its size in memory, its conversions, and how a value is added to a
+// stored channel. Loads and stores go through memcpy, which compiles to plain moves and keeps the
+// code free of alignment assumptions.
 struct ByteChannel {
     static constexpr int SIZE = 1;
     static float load(const unsigned char* p) { return IxPixelConvert::byteToFloat(*p); }
     static void store(unsigned char* p, float v) { *p = IxPixelConvert::floatToByte(v); }
+    // The value is rounded to a byte first; the sum saturates in integers.
+    static void add(unsigned char* p, float v) {
+        const unsigned sum = unsigned{*p} + unsigned{IxPixelConvert::floatToByte(v)};
+        *p = static_cast<unsigned char>(sum < 255u ? sum : 255u);
+    }
 };
 
 struct HalfChannel {
@@ -30,6 +39,10 @@ struct HalfChannel {
         const std::uint16_t h = IxPixelConvert::floatToHalf(v);
         std::memcpy(p, &h, sizeof h);
     }
+    // The value is rounded to a half first, so that each pass rounds on its own.
+    static void add(unsigned char* p, float v) {
+        store(p, load(p) + IxPixelConvert::halfToFloat(IxPixelConvert::floatToHalf(v)));
+    }
 };
 
 struct FloatChannel {
@@ -40,6 +53,7 @@ struct FloatChannel {
         return v;
     }
     static void store(unsigned char* p, float v) { std::memcpy(p, &v, sizeof v); }
+    static void add(unsigned char* p, float v) { store(p, load(p) + v); }
 };
 
 // A pair of floats, real part first.
@@ -50,88 +64,95 @@ struct ComplexChannel {
         FloatChannel::store(p, v);
         FloatChannel::store(p + 4, 0.0f);
     }
+    static void add(unsigned char* p, float v) { FloatChannel::add(p, v); }
 };
 
 template <class Channel, int COMPS>
-void readRow(const unsigned char* src, Rgba* dst, int count) {
-    constexpr int C = Channel::SIZE;
-    for (int i = 0; i < count; ++i, src += COMPS * C) {
-        Rgba& out = dst[i];
-        if constexpr (COMPS == 1) {
-            out.r = out.g = out.b = 0.0f;
-            out.a = Channel::load(src);
-        } else {
-            out.r = Channel::load(src);
-            out.g = Channel::load(src + C);
-            out.b = Channel::load(src + 2 * C);
-            out.a = COMPS == 4 ? Channel::load(src + 3 * C) : 1.0f;
+struct ReadRow {
+    static void run(const unsigned char* src, Rgba* dst, int count) {
+        constexpr int C = Channel::SIZE;
+        for (int i = 0; i < count; ++i, src += COMPS * C) {
+            Rgba& out = dst[i];
+            if constexpr (COMPS == 1) {
+                out.r = out.g = out.b = 0.0f;
+                out.a = Channel::load(src);
+            } else {
+                out.r = Channel::load(src);
+                out.g = Channel::load(src + C);
+                out.b = Channel::load(src + 2 * C);
+                out.a = COMPS == 4 ? Channel::load(src + 3 * C) : 1.0f;
+            }
         }
     }
-}
+};
+
+// Stores (ADD false) or adds (ADD true) the channels that the format has.
+template <class Channel, int COMPS, bool ADD>
+struct WriteRow {
+    static void put(unsigned char* p, float v) {
+        if constexpr (ADD)
+            Channel::add(p, v);
+        else
+            Channel::store(p, v);
+    }
+    static void run(unsigned char* dst, const Rgba* src, int count) {
+        constexpr int C = Channel::SIZE;
+        for (int i = 0; i < count; ++i, dst += COMPS * C) {
+            const Rgba& in = src[i];
+            // A colour without coverage adds nothing; alpha gates even where it is not stored.
+            if constexpr (ADD) {
+                if (in.a == 0.0f) continue;
+            }
+            if constexpr (COMPS == 1) {
+                put(dst, in.a);
+            } else {
+                put(dst, in.r);
+                put(dst + C, in.g);
+                put(dst + 2 * C, in.b);
+                if constexpr (COMPS == 4) put(dst + 3 * C, in.a);
+            }
+        }
+    }
+};
 
 template <class Channel, int COMPS>
-void writeRow(unsigned char* dst, const Rgba* src, int count) {
-    constexpr int C = Channel::SIZE;
-    for (int i = 0; i < count; ++i, dst += COMPS * C) {
-        const Rgba& in = src[i];
-        if constexpr (COMPS == 1) {
-            Channel::store(dst, in.a);
-        } else {
-            Channel::store(dst, in.r);
-            Channel::store(dst + C, in.g);
-            Channel::store(dst + 2 * C, in.b);
-            if constexpr (COMPS == 4) Channel::store(dst + 3 * C, in.a);
-        }
-    }
-}
+using StoreRow = WriteRow<Channel, COMPS, false>;
+template <class Channel, int COMPS>
+using AddRow = WriteRow<Channel, COMPS, true>;
 
-// The table entry for one channel type, by channel count; null for an unknown count.
-template <class Channel>
-IxRowCodec::Reader readerFor(int comps) {
+// Row<Channel, comps>::run; null for an unknown channel count.
+template <template <class, int> class Row, class Channel>
+auto rowFunctionOf(int comps) -> decltype(&Row<Channel, 1>::run) {
     switch (comps) {
-    case IxPixelFormat::ALPHA: return &readRow<Channel, 1>;
-    case IxPixelFormat::RGB: return &readRow<Channel, 3>;
-    case IxPixelFormat::RGBA: return &readRow<Channel, 4>;
+    case IxPixelFormat::ALPHA: return &Row<Channel, 1>::run;
+    case IxPixelFormat::RGB: return &Row<Channel, 3>::run;
+    case IxPixelFormat::RGBA: return &Row<Channel, 4>::run;
     }
     return nullptr;
 }
 
-template <class Channel>
-IxRowCodec::Writer writerFor(int comps) {
-    switch (comps) {
-    case IxPixelFormat::ALPHA: return &writeRow<Channel, 1>;
-    case IxPixelFormat::RGB: return &writeRow<Channel, 3>;
-    case IxPixelFormat::RGBA: return &writeRow<Channel, 4>;
+// Row<Channel, comps>::run for the format's channel type and count.
+template <template <class, int> class Row>
+auto rowFunctionOf(const IxPixelFormat& format) -> decltype(&Row<ByteChannel, 1>::run) {
+    decltype(&Row<ByteChannel, 1>::run) function = nullptr;
+    switch (format._depth) {
+    case IxPixelFormat::UINT8: function = rowFunctionOf<Row, ByteChannel>(format._comps); break;
+    case IxPixelFormat::FLOAT16: function = rowFunctionOf<Row, HalfChannel>(format._comps); break;
+    case IxPixelFormat::FLOAT32: function = rowFunctionOf<Row, FloatChannel>(format._comps); break;
+    case IxPixelFormat::COMPLEX: function = rowFunctionOf<Row, ComplexChannel>(format._comps); break;
     }
-    return nullptr;
+    if (function == nullptr) Assertions::throwProgramAborted(kSourceFile, __LINE__, "unknown pixel format");
+    return function;
 }
-
-constexpr const char* sourceFile = ".\\pluginAPI/imageAPI/src/ixRowCodec.cpp";
 
 }  // namespace
 
-IxRowCodec::Reader IxRowCodec::selectReader(const IxPixelFormat& format) {
-    Reader reader = nullptr;
-    switch (format._depth) {
-    case IxPixelFormat::UINT8: reader = readerFor<ByteChannel>(format._comps); break;
-    case IxPixelFormat::FLOAT16: reader = readerFor<HalfChannel>(format._comps); break;
-    case IxPixelFormat::FLOAT32: reader = readerFor<FloatChannel>(format._comps); break;
-    case IxPixelFormat::COMPLEX: reader = readerFor<ComplexChannel>(format._comps); break;
-    }
-    if (reader == nullptr) Assertions::throwProgramAborted(sourceFile, __LINE__, "unknown pixel format");
-    return reader;
-}
+IxRowCodec::Reader IxRowCodec::selectReader(const IxPixelFormat& format) { return rowFunctionOf<ReadRow>(format); }
 
-IxRowCodec::Writer IxRowCodec::selectWriter(const IxPixelFormat& format) {
-    Writer writer = nullptr;
-    switch (format._depth) {
-    case IxPixelFormat::UINT8: writer = writerFor<ByteChannel>(format._comps); break;
-    case IxPixelFormat::FLOAT16: writer = writerFor<HalfChannel>(format._comps); break;
-    case IxPixelFormat::FLOAT32: writer = writerFor<FloatChannel>(format._comps); break;
-    case IxPixelFormat::COMPLEX: writer = writerFor<ComplexChannel>(format._comps); break;
-    }
-    if (writer == nullptr) Assertions::throwProgramAborted(sourceFile, __LINE__, "unknown pixel format");
-    return writer;
+IxRowCodec::Writer IxRowCodec::selectWriter(const IxPixelFormat& format) { return rowFunctionOf<StoreRow>(format); }
+
+IxRowCodec::Writer IxRowCodec::selectAddingWriter(const IxPixelFormat& format) {
+    return rowFunctionOf<AddRow>(format);
 }
 
 }  // namespace Zr

@@ -102,8 +102,8 @@ void RsImageCreatorFZ::createImage(RsFragment* const* lists, const GeRectangle<i
     RsImageCreatorUtil::RowFunctions functions;
     const IxPixelFormat& inFormat = background._pixelFormat;
     const IxPixelFormat& outFormat = output._pixelFormat;
-    RsImageCreatorUtil::selectRowReader(functions, inFormat._comps, inFormat._depth);
-    RsImageCreatorUtil::selectRowWriter(functions, outFormat._comps, outFormat._depth, accumulate);
+    RsImageCreatorUtil::selectRowReader(functions, inFormat);
+    RsImageCreatorUtil::selectRowWriter(functions, outFormat, accumulate);
     if (width <= 0) return;
 
     const bool scale = !RsTolerance::isEqual(weight, 1.0f);
@@ -123,13 +123,13 @@ void RsImageCreatorFZ::createImage(RsFragment* const* lists, const GeRectangle<i
                 const unsigned char* pixels = background._basePointer +
                                               std::ptrdiff_t(y) * background._rowStride +
                                               std::ptrdiff_t(left) * inPixelBytes;
-                functions._reader(row + leftPad, rowEnd - rightPad, pixels);
+                functions._reader(pixels, row + leftPad, width - leftPad - rightPad);
             }
         }
         compositeRow(row, width, lists + std::ptrdiff_t(y - y0) * width, scale, weight, unpremultiply);
         unsigned char* pixels = output._basePointer + std::ptrdiff_t(y) * output._rowStride +
                                 std::ptrdiff_t(x0) * outPixelBytes;
-        functions._writer(row, rowEnd, pixels);
+        functions._writer(pixels, row, width);
     }
 }
 
