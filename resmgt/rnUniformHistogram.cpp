@@ -1,5 +1,6 @@
 #include "rnUniformHistogram.h"
 
+#include <algorithm>
 #include <cmath>
 
 #include "assertions.h"
@@ -38,9 +39,7 @@ int RnUniformHistogram<T>::findBin(T value) const {
 
     const T min = this->getMin();
     const T fraction = (value - min) / (this->getMax() - min);
-    int bin = static_cast<int>(std::floor(fraction * T(n)));
-    if (bin > n - 1) bin = n - 1;
-    if (bin < 0) bin = 0;
+    int bin = std::clamp(static_cast<int>(std::floor(fraction * T(n))), 0, n - 1);
     // The scaled position can round across an edge; stepping puts the value in the bin whose
     // stated edges hold it. One step at most, unless the bins are a few ulps wide.
     while (bin > 0 && value < edge(bin)) --bin;

@@ -1,7 +1,8 @@
 #pragma once
-// The float tolerance with which the fragment buffers and the image creators compare a value with
-// a constant: whether an alpha counts as one (an opaque fragment), whether a weight counts as one
-// (no scaling), whether an alpha counts as zero (nothing to add).
+// The float tolerance with which the fragment buffers, the image creators and the transfer
+// functions compare a value with a constant: whether an alpha counts as one (an opaque fragment),
+// whether a weight counts as one (no scaling), whether an alpha counts as zero (nothing to add, a
+// destination to take as black).
 //
 // The tolerance is the float epsilon times the larger magnitude of the two, where an infinite
 // magnitude counts as 0, so that an infinity never equals a finite constant. The comparison is

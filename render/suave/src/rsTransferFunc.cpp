@@ -6,6 +6,7 @@
 #include <iterator>
 
 #include "coHsvColor.h"
+#include "rsTolerance.h"
 
 namespace Zr {
 
@@ -35,21 +36,10 @@ inline void compositeChannels(const Rgba& source, const Rgba& destination, Rgba&
     result.a = a;
 }
 
-// Equality with 0 under the tolerance that the image creators use: the tolerance is the float
-// epsilon times the magnitude, where an infinite magnitude counts as 0. In effect only a signed
-// zero passes, but the test is kept in this form so that all resolve code decides alike.
-inline bool isZeroRelative(float v) {
-    float m = std::fabs(v);
-    if (std::isinf(m)) m = 0.0F;
-    const float e = m * std::bit_cast<float>(std::uint32_t{0x34000000});
-    if (v > 0.0F) return e >= v;
-    return e + v >= 0.0F;
-}
-
-// The destination without its alpha: black where the alpha is 0, else d * (1 / da).
+// The destination without its alpha: black where the alpha counts as zero, else d * (1 / da).
 inline Rgb unpremultiplied(const Rgba& destination) {
     Rgb out;
-    if (isZeroRelative(destination.a)) {
+    if (RsTolerance::isZero(destination.a)) {
         out.r = 0.0F;
         out.g = 0.0F;
         out.b = 0.0F;
