@@ -8,14 +8,14 @@
 namespace Zr {
 
 namespace {
-const char* const sourcePath = ".\\primitives/sdCamera.cpp";
+constexpr const char* kSourceFile = ".\\primitives/sdCamera.cpp";
 }
 
 void SdCamera::computeProjection(GeProjectiveMatrix3<double>& result,
                                  std::pair<float, float> lensOffset) const {
-    ZR_ASSERT_AT(_aspect > 0.0f, sourcePath, __LINE__);
-    ZR_ASSERT_AT(_near < _far, sourcePath, __LINE__);
-    ZR_ASSERT_AT(_focalDistance > 0.0f, sourcePath, __LINE__);
+    ZR_ASSERT_AT(_aspect > 0.0f, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(_near < _far, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(_focalDistance > 0.0f, kSourceFile, __LINE__);
     const double n = _near;
     const double f = _far;
 
@@ -23,16 +23,16 @@ void SdCamera::computeProjection(GeProjectiveMatrix3<double>& result,
     double scaleX, scaleY;
     result = GeProjectiveMatrix3<double>();
     if (_projection == Projection::orthographic) {
-        ZR_ASSERT_AT(_orthographicHeight > 0.0f, sourcePath, __LINE__);
+        ZR_ASSERT_AT(_orthographicHeight > 0.0f, kSourceFile, __LINE__);
         scaleY = 2.0 / _orthographicHeight;
         scaleX = scaleY / _aspect;
         result(2, 2) = -2.0 / (f - n);
         result(2, 3) = -(f + n) / (f - n);
         // Row 3 stays (0, 0, 0, 1): w does not depend on z.
     } else {
-        ZR_ASSERT_AT(_fieldOfView > 0.0f && _fieldOfView < std::numbers::pi_v<float>, sourcePath,
+        ZR_ASSERT_AT(_fieldOfView > 0.0f && _fieldOfView < std::numbers::pi_v<float>, kSourceFile,
                      __LINE__);
-        ZR_ASSERT_AT(_near > 0.0f, sourcePath, __LINE__);
+        ZR_ASSERT_AT(_near > 0.0f, kSourceFile, __LINE__);
         scaleY = 1.0 / std::tan(0.5 * _fieldOfView);
         scaleX = scaleY / _aspect;
         result(2, 2) = (f + n) / (n - f);

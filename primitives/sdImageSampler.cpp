@@ -10,6 +10,8 @@ namespace Zr {
 
 namespace {
 
+constexpr const char* kSourceFile = ".\\primitives/sdImageSampler.cpp";
+
 const CoRgbaColorTyped<float> transparent{0.0f, 0.0f, 0.0f, 0.0f};
 
 // How many evenly spread lookups cover a box of the given width in texels.
@@ -23,8 +25,7 @@ int boxSampleCount(double widthInTexels) {
 SdImageSampler::SdImageSampler(RCShdPtr<const SdTexture> texture, SdTextureParams::Filter filter,
                                SdTextureParams::Wrap wrap)
     : _texture(std::move(texture)), _filter(filter), _wrap(wrap) {
-    ZR_ASSERT_AT(!_texture.isNull() && !_texture->isEmpty(), ".\\primitives/sdImageSampler.cpp",
-                 __LINE__);
+    ZR_ASSERT_AT(!_texture.isNull() && !_texture->isEmpty(), kSourceFile, __LINE__);
 }
 
 SdImageSampler::~SdImageSampler() = default;

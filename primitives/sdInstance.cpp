@@ -6,6 +6,10 @@
 
 namespace Zr {
 
+namespace {
+constexpr const char* kSourceFile = ".\\primitives/sdInstance.cpp";
+}
+
 SdInstance::SdInstance(RCShdPtr<SdObject> object, const GeAffineMatrix3<float>& matrix)
     : _matrix(matrix), _object(std::move(object)) {}
 
@@ -22,7 +26,7 @@ void SdInstance::addMaterial(RCShdPtr<const SdMaterial> material) {
 }
 
 const RCShdPtr<const SdMaterial>& SdInstance::getMaterialOfGroup(unsigned int groupIndex) const {
-    ZR_ASSERT_AT(!_materials.empty(), ".\\primitives/sdInstance.cpp", __LINE__);
+    ZR_ASSERT_AT(!_materials.empty(), kSourceFile, __LINE__);
     return _materials[groupIndex % _materials.size()];
 }
 

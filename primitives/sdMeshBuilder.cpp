@@ -9,7 +9,7 @@ namespace Zr {
 
 namespace {
 
-const char* const sourcePath = ".\\primitives/sdMeshBuilder.cpp";
+constexpr const char* kSourceFile = ".\\primitives/sdMeshBuilder.cpp";
 
 // The vector arithmetic is spelled out on components, in double, so that normals of small or
 // thin faces keep their precision.
@@ -37,12 +37,12 @@ GeVector3<float> unitOrZero(const Vec& a) {
 
 std::vector<SdMeshTypes::FaceImp> facesOf(const std::vector<std::uint32_t>& indices,
                                           std::size_t vertexCount) {
-    ZR_ASSERT_AT(indices.size() % 3 == 0, sourcePath, __LINE__);
+    ZR_ASSERT_AT(indices.size() % 3 == 0, kSourceFile, __LINE__);
     std::vector<SdMeshTypes::FaceImp> faces(indices.size() / 3);
     for (std::size_t f = 0; f < faces.size(); ++f) {
         for (int c = 0; c < 3; ++c) {
             const std::uint32_t index = indices[3 * f + c];
-            ZR_ASSERT_AT(index < vertexCount, sourcePath, __LINE__);
+            ZR_ASSERT_AT(index < vertexCount, kSourceFile, __LINE__);
             faces[f]._vertexIndices[c] = index;
         }
     }
@@ -103,7 +103,7 @@ RCShdPtr<SdMesh> SdMeshBuilder::make(bool withDerivedData) const {
     const std::size_t vertexCount = _vertices.size();
     std::vector<SdMeshTypes::FaceImp> faces = facesOf(_indices, vertexCount);
     const std::size_t faceCount = faces.size();
-    ZR_ASSERT_AT(_normals.empty() || _normals.size() == vertexCount, sourcePath, __LINE__);
+    ZR_ASSERT_AT(_normals.empty() || _normals.size() == vertexCount, kSourceFile, __LINE__);
 
     std::vector<SdMeshTypes::FaceGroup> groups;
     if (_groupSizes.empty()) {
@@ -117,7 +117,7 @@ RCShdPtr<SdMesh> SdMeshBuilder::make(bool withDerivedData) const {
                                                     static_cast<SdMeshTypes::Index>(size)});
             first += size;
         }
-        ZR_ASSERT_AT(first == faceCount, sourcePath, __LINE__);
+        ZR_ASSERT_AT(first == faceCount, kSourceFile, __LINE__);
     }
 
     std::vector<SdMesh::TextureChannel> channels;
@@ -126,7 +126,7 @@ RCShdPtr<SdMesh> SdMeshBuilder::make(bool withDerivedData) const {
         SdMesh::TextureChannel channel;
         channel._coordinates = pending._coordinates;
         if (pending._indices.empty()) {
-            ZR_ASSERT_AT(pending._coordinates.size() == vertexCount, sourcePath, __LINE__);
+            ZR_ASSERT_AT(pending._coordinates.size() == vertexCount, kSourceFile, __LINE__);
             channel._faces.resize(faceCount);
             for (std::size_t f = 0; f < faceCount; ++f) {
                 for (int c = 0; c < 3; ++c) {
@@ -134,12 +134,12 @@ RCShdPtr<SdMesh> SdMeshBuilder::make(bool withDerivedData) const {
                 }
             }
         } else {
-            ZR_ASSERT_AT(pending._indices.size() == 3 * faceCount, sourcePath, __LINE__);
+            ZR_ASSERT_AT(pending._indices.size() == 3 * faceCount, kSourceFile, __LINE__);
             channel._faces.resize(faceCount);
             for (std::size_t f = 0; f < faceCount; ++f) {
                 for (int c = 0; c < 3; ++c) {
                     const std::uint32_t index = pending._indices[3 * f + c];
-                    ZR_ASSERT_AT(index < pending._coordinates.size(), sourcePath, __LINE__);
+                    ZR_ASSERT_AT(index < pending._coordinates.size(), kSourceFile, __LINE__);
                     channel._faces[f]._textureIndices[c] = index;
                 }
             }

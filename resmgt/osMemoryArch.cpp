@@ -8,6 +8,10 @@
 
 namespace Zr {
 
+namespace {
+constexpr const char* kSourceFile = ".\\resmgt/osMemoryArch.cpp";
+}
+
 OsMemoryArch::~OsMemoryArch() = default;
 
 OsMemoryArch* OsMemoryArch::getInstance() { return LkSingleton<OsMemoryArch>::getInstance(); }
@@ -19,8 +23,7 @@ void* OsMemoryArch::allocate(std::size_t bytes) {
                                  std::align_val_t(static_cast<std::size_t>(DEFAULT_ALIGNMENT)),
                                  std::nothrow);
     if (block == nullptr) {
-        throw ExOutOfMemory(".\\resmgt/osMemoryArch.cpp", __LINE__,
-                            "cannot allocate " + std::to_string(bytes) + " bytes");
+        throw ExOutOfMemory(kSourceFile, __LINE__, "cannot allocate " + std::to_string(bytes) + " bytes");
     }
     return block;
 }

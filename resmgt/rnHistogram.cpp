@@ -5,13 +5,13 @@
 namespace Zr {
 
 namespace {
-const char* const sourcePath = ".\\resmgt/rnHistogram.cpp";
+constexpr const char* kSourceFile = ".\\resmgt/rnHistogram.cpp";
 }
 
 template <class T>
 RnHistogram<T>::RnHistogram(int nbBins, T min, T max) : _min(min), _max(max) {
-    ZR_ASSERT_AT(nbBins >= 1, sourcePath, __LINE__);
-    ZR_ASSERT_AT(min < max, sourcePath, __LINE__);
+    ZR_ASSERT_AT(nbBins >= 1, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(min < max, kSourceFile, __LINE__);
     _bins.assign(static_cast<std::size_t>(nbBins), T(0));
 }
 
@@ -20,7 +20,7 @@ RnHistogram<T>::~RnHistogram() = default;
 
 template <class T>
 void RnHistogram<T>::checkBin(int bin) const {
-    ZR_ASSERT_AT(bin >= 0 && bin < getNbBins(), sourcePath, __LINE__);
+    ZR_ASSERT_AT(bin >= 0 && bin < getNbBins(), kSourceFile, __LINE__);
 }
 
 template <class T>

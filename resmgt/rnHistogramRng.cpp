@@ -8,12 +8,12 @@
 namespace Zr {
 
 namespace {
-const char* const sourcePath = ".\\resmgt/rnHistogramRng.cpp";
+constexpr const char* kSourceFile = ".\\resmgt/rnHistogramRng.cpp";
 }
 
 template <class T>
 RnHistogramRng<T>::RnHistogramRng(const RnHistogram<T>& histogram, RnRng<T>* rng) : _rng(rng) {
-    ZR_ASSERT_AT(rng != 0, sourcePath, __LINE__);
+    ZR_ASSERT_AT(rng != 0, kSourceFile, __LINE__);
     const int n = histogram.getNbBins();
     _edges.reserve(static_cast<std::size_t>(n) + 1);
     _weights.reserve(static_cast<std::size_t>(n));
@@ -22,20 +22,20 @@ RnHistogramRng<T>::RnHistogramRng(const RnHistogram<T>& histogram, RnRng<T>* rng
     // Partial sums in double, so that thousands of float bins still sum without visible loss.
     for (int i = 0; i < n; ++i) {
         const double weight = static_cast<double>(histogram.getBin(i));
-        ZR_ASSERT_AT(weight >= 0.0 && std::isfinite(weight), sourcePath, __LINE__);
+        ZR_ASSERT_AT(weight >= 0.0 && std::isfinite(weight), kSourceFile, __LINE__);
         _edges.push_back(histogram.getBinStart(i));
         _weights.push_back(weight);
         _cumulative.push_back(_cumulative.back() + weight);
     }
     _edges.push_back(histogram.getBinEnd(n - 1));
     const double sum = _cumulative.back();
-    ZR_ASSERT_AT(sum > 0.0 && std::isfinite(sum), sourcePath, __LINE__);
+    ZR_ASSERT_AT(sum > 0.0 && std::isfinite(sum), kSourceFile, __LINE__);
 
     _density.reserve(static_cast<std::size_t>(n));
     for (int i = 0; i < n; ++i) {
         const double width = static_cast<double>(histogram.getBinWidth(i));
         // A bin that can be drawn needs room for its values.
-        ZR_ASSERT_AT(_weights[i] == 0.0 || width > 0.0, sourcePath, __LINE__);
+        ZR_ASSERT_AT(_weights[i] == 0.0 || width > 0.0, kSourceFile, __LINE__);
         _density.push_back(_weights[i] == 0.0 ? T(0) : static_cast<T>(_weights[i] / sum / width));
     }
 }

@@ -5,12 +5,12 @@
 namespace Zr {
 
 namespace {
-const char* const sourcePath = ".\\resmgt/rnSeparableBiRng.cpp";
+constexpr const char* kSourceFile = ".\\resmgt/rnSeparableBiRng.cpp";
 }
 
 template <class T>
 RnSeparableBiRng<T>::RnSeparableBiRng(RnRng<T>* rng) : _rng(rng) {
-    ZR_ASSERT_AT(rng != 0, sourcePath, __LINE__);
+    ZR_ASSERT_AT(rng != 0, kSourceFile, __LINE__);
 }
 
 template <class T>

@@ -8,14 +8,14 @@
 namespace Zr {
 
 namespace {
-const char* const sourcePath = ".\\resmgt/rnUniformHistogram.cpp";
+constexpr const char* kSourceFile = ".\\resmgt/rnUniformHistogram.cpp";
 }
 
 template <class T>
 RnUniformHistogram<T>::RnUniformHistogram(int nbBins, T min, T max)
     : RnHistogram<T>(nbBins, min, max) {
     // The width must be a number for the lookup's arithmetic to mean anything.
-    ZR_ASSERT_AT(std::isfinite(max - min), sourcePath, __LINE__);
+    ZR_ASSERT_AT(std::isfinite(max - min), kSourceFile, __LINE__);
 }
 
 template <class T>
@@ -49,19 +49,19 @@ int RnUniformHistogram<T>::findBin(T value) const {
 
 template <class T>
 T RnUniformHistogram<T>::getBinStart(int bin) const {
-    ZR_ASSERT_AT(bin >= 0 && bin < this->getNbBins(), sourcePath, __LINE__);
+    ZR_ASSERT_AT(bin >= 0 && bin < this->getNbBins(), kSourceFile, __LINE__);
     return edge(bin);
 }
 
 template <class T>
 T RnUniformHistogram<T>::getBinEnd(int bin) const {
-    ZR_ASSERT_AT(bin >= 0 && bin < this->getNbBins(), sourcePath, __LINE__);
+    ZR_ASSERT_AT(bin >= 0 && bin < this->getNbBins(), kSourceFile, __LINE__);
     return edge(bin + 1);
 }
 
 template <class T>
 T RnUniformHistogram<T>::getBinWidth(int bin) const {
-    ZR_ASSERT_AT(bin >= 0 && bin < this->getNbBins(), sourcePath, __LINE__);
+    ZR_ASSERT_AT(bin >= 0 && bin < this->getNbBins(), kSourceFile, __LINE__);
     return (this->getMax() - this->getMin()) / T(this->getNbBins());
 }
 

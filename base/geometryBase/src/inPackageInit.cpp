@@ -10,7 +10,7 @@
 namespace Zr {
 
 namespace {
-const char* const sourcePath = ".\\base/geometryBase/src/inPackageInit.cpp";
+constexpr const char* kSourceFile = ".\\base/geometryBase/src/inPackageInit.cpp";
 }
 
 InPackageInitBase::InPackageInitBase(const char* name) : InVariableBase(name) {}
@@ -25,7 +25,7 @@ void InPackageInitBase::registerPackage() {
     if (_registered) return;
     const InPackageInitBase* other = InPackageRegistry::findByNameLocked(getName());
     if (other != nullptr) {
-        Assertions::throwAssertionFailed(sourcePath, __LINE__,
+        Assertions::throwAssertionFailed(kSourceFile, __LINE__,
                                          "one registered package per package name");
     }
     InPackageRegistry::addLocked(this);
@@ -38,7 +38,7 @@ bool InPackageInitBase::isRegistered() const {
 }
 
 void InPackageInitBase::addDependency(const std::type_info* tag) {
-    if (tag == nullptr) Assertions::throwAssertionFailed(sourcePath, __LINE__, "tag != 0");
+    if (tag == nullptr) Assertions::throwAssertionFailed(kSourceFile, __LINE__, "tag != 0");
     LkLockGuard guard(InPackageRegistry::getLock());
     const bool known = std::any_of(_dependencies.begin(), _dependencies.end(),
                                    [tag](const Dependency& d) { return d.tag && *d.tag == *tag; });
@@ -46,7 +46,7 @@ void InPackageInitBase::addDependency(const std::type_info* tag) {
 }
 
 void InPackageInitBase::addDependency(InVariableBase* variable) {
-    if (variable == nullptr) Assertions::throwAssertionFailed(sourcePath, __LINE__, "variable != 0");
+    if (variable == nullptr) Assertions::throwAssertionFailed(kSourceFile, __LINE__, "variable != 0");
     LkLockGuard guard(InPackageRegistry::getLock());
     const bool known = std::any_of(_dependencies.begin(), _dependencies.end(),
                                    [variable](const Dependency& d) { return d.variable == variable; });

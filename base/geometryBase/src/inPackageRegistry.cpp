@@ -9,7 +9,7 @@ namespace Zr {
 
 namespace {
 
-const char* const sourcePath = ".\\base/geometryBase/src/inPackageRegistry.cpp";
+constexpr const char* kSourceFile = ".\\base/geometryBase/src/inPackageRegistry.cpp";
 
 struct RegistryState {
     LkLock lock{"InPackageRegistry lock"};
@@ -107,7 +107,7 @@ std::vector<std::string> InPackageRegistry::computeStartOrder() {
             }
         }
         if (!progressed) {
-            Assertions::throwAssertionFailed(sourcePath, __LINE__,
+            Assertions::throwAssertionFailed(kSourceFile, __LINE__,
                                              "no dependency cycle between packages");
         }
     }

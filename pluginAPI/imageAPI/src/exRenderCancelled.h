@@ -8,13 +8,18 @@
 
 namespace Zr {
 
+namespace ExRenderCancelledSource {
+// The request manager, whose cancel flag raises the failure.
+constexpr const char* kSourceFile = ".\\pluginAPI/imageAPI/src/pxRequestMgr.cpp";
+}  // namespace ExRenderCancelledSource
+
 class ExRenderCancelled : public ExBase {
 public:
     using ExBase::ExBase;
     // The failure reported by the request manager's own cancel flag.
-    ExRenderCancelled() : ExBase(".\\pluginAPI/imageAPI/src/pxRequestMgr.cpp", 0, "render cancelled") {}
+    ExRenderCancelled() : ExBase(ExRenderCancelledSource::kSourceFile, 0, "render cancelled") {}
     explicit ExRenderCancelled(std::string message)
-        : ExBase(".\\pluginAPI/imageAPI/src/pxRequestMgr.cpp", 0, std::move(message)) {}
+        : ExBase(ExRenderCancelledSource::kSourceFile, 0, std::move(message)) {}
 };
 
 }  // namespace Zr

@@ -28,9 +28,9 @@ void IxGuardProxy::releaseGuards() {
 }
 
 const IxReadGuard& IxGuardProxy::getGuard(int index) const {
-    constexpr const char* file = ".\\pluginAPI/imageAPI/src/ixGuardProxy.cpp";
-    ZR_ASSERT_AT(index >= 0 && index < getTileCount(), file, __LINE__);
-    ZR_ASSERT_AT(_taken, file, __LINE__);
+    constexpr const char* kSourceFile = ".\\pluginAPI/imageAPI/src/ixGuardProxy.cpp";
+    ZR_ASSERT_AT(index >= 0 && index < getTileCount(), kSourceFile, __LINE__);
+    ZR_ASSERT_AT(_taken, kSourceFile, __LINE__);
     return _guards[static_cast<std::size_t>(index)];
 }
 

@@ -67,11 +67,11 @@ private:
 
 template <class Pixel>
 IxScanline<Pixel>::IxScanline(const IxWriteGuard& guard, int y) : _guard(guard), _y(y), _row(nullptr) {
-    constexpr const char* file = ".\\pluginAPI/imageAPI/src/ixScanline.h";
-    ZR_ASSERT_AT(guard.holdsTile(), file, __LINE__);
-    ZR_ASSERT_AT(guard._pixelFormat._comps == IxScanlinePixel<Pixel>::COMPS, file, __LINE__);
-    ZR_ASSERT_AT(guard._pixelFormat._depth == IxScanlinePixel<Pixel>::DEPTH, file, __LINE__);
-    ZR_ASSERT_AT(y >= guard._rectangle.y0 && y < guard._rectangle.y1, file, __LINE__);
+    constexpr const char* kSourceFile = ".\\pluginAPI/imageAPI/src/ixScanline.h";
+    ZR_ASSERT_AT(guard.holdsTile(), kSourceFile, __LINE__);
+    ZR_ASSERT_AT(guard._pixelFormat._comps == IxScanlinePixel<Pixel>::COMPS, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(guard._pixelFormat._depth == IxScanlinePixel<Pixel>::DEPTH, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(y >= guard._rectangle.y0 && y < guard._rectangle.y1, kSourceFile, __LINE__);
     _row = reinterpret_cast<Pixel*>(guard.getPixelAddress(guard._rectangle.x0, y));
 }
 

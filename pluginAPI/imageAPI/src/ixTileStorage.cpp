@@ -11,7 +11,7 @@ namespace Zr {
 
 namespace {
 
-constexpr const char* sourceFile = ".\\pluginAPI/imageAPI/src/ixTileStorage.cpp";
+constexpr const char* kSourceFile = ".\\pluginAPI/imageAPI/src/ixTileStorage.cpp";
 
 int extent(int from, int to) { return to > from ? to - from : 0; }
 
@@ -30,7 +30,7 @@ IxTileStorage::IxTileStorage(const IxPixelFormat& format, const GeRectangle<int>
     const std::int64_t bytesPerPixel = format.getBytesPerPixel();
     const std::int64_t stride = static_cast<std::int64_t>(_width) * bytesPerPixel;
     if (stride > std::numeric_limits<int>::max()) {
-        throw ExOutOfMemory(sourceFile, __LINE__,
+        throw ExOutOfMemory(kSourceFile, __LINE__,
                             "tile row of " + std::to_string(stride) + " bytes is too long");
     }
     _rowStride = static_cast<int>(stride);

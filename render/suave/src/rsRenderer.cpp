@@ -12,7 +12,7 @@ namespace Zr {
 
 namespace {
 
-const char* const kSourcePath = "render\\suave\\src\\rsRenderer";
+constexpr const char* kSourceFile = "render\\suave\\src\\rsRenderer";
 
 // Steps 2 to 7 of a render on the path of Factory, whose settings are made: the scene renderer
 // with its matrices, the lights, the culled instance list, and the region recursion over the
@@ -67,7 +67,7 @@ void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatr
                               const GeRectangle<int>& rectangle, const IxWriteGuard& output,
                               bool unpremultiply) {
     if (_antialiasing)
-        Assertions::throwProgramAborted(kSourcePath, __LINE__,
+        Assertions::throwProgramAborted(kSourceFile, __LINE__,
                                         "antialiased rendering is not available: the A-buffer path is missing");
     RsFZBufferFactory factory;
     factory.setZBuffer(_zBuffer);
@@ -88,11 +88,11 @@ void RsRenderer::dump(std::ostream& os) const {
 }
 
 unsigned int RsRenderer::getMemUsageMb() const {
-    Assertions::throwProgramAborted(kSourcePath, 397, nullptr);
+    Assertions::throwProgramAborted(kSourceFile, 397, nullptr);
 }
 
 unsigned int RsRenderer::getTileMemUsageMb() const {
-    Assertions::throwProgramAborted(kSourcePath, 409, nullptr);
+    Assertions::throwProgramAborted(kSourceFile, 409, nullptr);
 }
 
 }  // namespace Zr

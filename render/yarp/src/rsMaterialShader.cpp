@@ -8,7 +8,7 @@ namespace Zr {
 namespace {
 // Where an unbalanced unlockMemory is reported. Hosts match on this position, so it is fixed and
 // does not follow edits to this file.
-constexpr const char* kUnlockAssertFile = "render\\yarp\\src\\rsMaterialShader";
+constexpr const char* kSourceFile = "render\\yarp\\src\\rsMaterialShader";
 constexpr int kUnlockAssertLine = 232;
 }  // namespace
 
@@ -40,7 +40,7 @@ void RsMaterialShader::lockMemory() {
 
 void RsMaterialShader::unlockMemory() {
     LkLockGuard guard(_lock);
-    ZR_ASSERT_AT(_lockCount > 0, kUnlockAssertFile, kUnlockAssertLine);
+    ZR_ASSERT_AT(_lockCount > 0, kSourceFile, kUnlockAssertLine);
     --_lockCount;
     if (_lockCount == 0) unlockMemoryImpl();
 }
