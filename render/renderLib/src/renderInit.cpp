@@ -10,8 +10,14 @@ namespace Zr {
 
 namespace {
 
-// The packages of this library, made in static initialisation in this order. Each registers,
-// then states what must be up before it, in the order given.
+// Registers a package, then states what must be up before it, in the order given.
+template <class... DependencyTags>
+void start(InPackageInit& package) {
+    package.registerPackage();
+    (package.addDependency(InInit<DependencyTags>::getType()), ...);
+}
+
+// The packages of this library, made in static initialisation in this order.
 struct RenderLibraryPackages {
     InInit<ZrInit::render> render{"render"};
     InInit<ZrInit::suave> suave{"suave"};
@@ -20,60 +26,18 @@ struct RenderLibraryPackages {
     const InBuildInfo* buildInfo = nullptr;
 
     RenderLibraryPackages() {
-        startRender();
-        startSuave();
-        startShaders();
-        startYarp();
+        namespace Tag = ZrInit;
+        start<Tag::media, Tag::internalAPI, Tag::primitives, Tag::pluginAPI, Tag::resmgt, Tag::base, Tag::suave,
+              Tag::shaders, Tag::yarp>(render);
+        buildInfo = &InBuildInfoUtil::registerInfo(OPtr<InBuildInfo>(new LibraryBuildInfo));
+        start<Tag::yarp, Tag::internalAPI, Tag::pluginAPI, Tag::primitives, Tag::resmgt, Tag::base>(suave);
+        start<Tag::yarp, Tag::suave, Tag::primitives, Tag::resmgt, Tag::base>(shaders);
+        start<Tag::primitives, Tag::resmgt, Tag::base>(yarp);
     }
 
     // The build record's methods are code of this library: it must not outlive it.
     ~RenderLibraryPackages() {
         if (buildInfo) InBuildInfoUtil::unregisterInfo(*buildInfo);
-    }
-
-    void startRender() {
-        render.registerPackage();
-        render.addDependency(InInit<ZrInit::media>::getType());
-        render.addDependency(InInit<ZrInit::internalAPI>::getType());
-        render.addDependency(InInit<ZrInit::primitives>::getType());
-        render.addDependency(InInit<ZrInit::pluginAPI>::getType());
-        render.addDependency(InInit<ZrInit::resmgt>::getType());
-        render.addDependency(InInit<ZrInit::base>::getType());
-        render.addDependency(InInit<ZrInit::suave>::getType());
-        render.addDependency(InInit<ZrInit::shaders>::getType());
-        render.addDependency(InInit<ZrInit::yarp>::getType());
-        buildInfo = &InBuildInfoUtil::registerInfo(OPtr<InBuildInfo>(new LibraryBuildInfo));
-    }
-
-    void startSuave() {
-        suave.registerPackage();
-        suave.addDependency(InInit<ZrInit::yarp>::getType());
-        suave.addDependency(InInit<ZrInit::internalAPI>::getType());
-        suave.addDependency(InInit<ZrInit::pluginAPI>::getType());
-        suave.addDependency(InInit<ZrInit::primitives>::getType());
-        suave.addDependency(InInit<ZrInit::resmgt>::getType());
-        suave.addDependency(InInit<ZrInit::base>::getType());
-    }
-
-    void startShaders() {
-        shaders.registerPackage();
-        shaders.addDependency(InInit<ZrInit::yarp>::getType());
-        shaders.addDependency(InInit<ZrInit::suave>::getType());
-        shaders.addDependency(InInit<ZrInit::primitives>::getType());
-        shaders.addDependency(InInit<ZrInit::resmgt>::getType());
-        shaders.addDependency(InInit<ZrInit::base>::getType());
-
-        // ---- Scene registry registrations of the standard shaders ----
-        // The "shaders" package enters its builders into the RsSceneRegistry singleton here:
-        // one for lights (SdStdLight), one for materials and one for shadow shaders (SdMaterial).
-        // ---- end of scene registry registrations ----
-    }
-
-    void startYarp() {
-        yarp.registerPackage();
-        yarp.addDependency(InInit<ZrInit::primitives>::getType());
-        yarp.addDependency(InInit<ZrInit::resmgt>::getType());
-        yarp.addDependency(InInit<ZrInit::base>::getType());
     }
 };
 
