@@ -12,6 +12,8 @@ namespace Zr {
 
 namespace {
 
+constexpr const char* kSourceFile = "tools\\sample\\zrShapes";
+
 struct MeshArrays {
     std::vector<GePoint3<float>> vertices;
     std::vector<GeVector3<float>> normals;
@@ -40,7 +42,7 @@ constexpr double twoPi = 2.0 * std::numbers::pi;
 }  // namespace
 
 RCShdPtr<const SdMesh> ZrShapes::makeGrid(float size, unsigned int cells, bool checker) {
-    ZR_ASSERT_AT(cells > 0, "tools\\zrender\\zrShapes", __LINE__);
+    ZR_ASSERT_AT(cells > 0, kSourceFile, __LINE__);
     MeshArrays mesh;
     const double step = static_cast<double>(size) / cells;
     const double origin = -0.5 * static_cast<double>(size);
@@ -69,7 +71,7 @@ RCShdPtr<const SdMesh> ZrShapes::makeGrid(float size, unsigned int cells, bool c
 }
 
 RCShdPtr<const SdMesh> ZrShapes::makeSphere(float radius, unsigned int slices, unsigned int stacks) {
-    ZR_ASSERT_AT(slices >= 3 && stacks >= 2, "tools\\zrender\\zrShapes", __LINE__);
+    ZR_ASSERT_AT(slices >= 3 && stacks >= 2, kSourceFile, __LINE__);
     MeshArrays mesh;
     const double r = radius;
     const std::uint32_t top = mesh.addVertex(0, r, 0, 0, 1, 0);
@@ -100,7 +102,7 @@ RCShdPtr<const SdMesh> ZrShapes::makeSphere(float radius, unsigned int slices, u
 
 RCShdPtr<const SdMesh> ZrShapes::makeTorus(float majorRadius, float minorRadius, unsigned int rings,
                                            unsigned int sides) {
-    ZR_ASSERT_AT(rings >= 3 && sides >= 3, "tools\\zrender\\zrShapes", __LINE__);
+    ZR_ASSERT_AT(rings >= 3 && sides >= 3, kSourceFile, __LINE__);
     MeshArrays mesh;
     for (unsigned int i = 0; i < rings; ++i) {
         const double u = twoPi * i / rings;
