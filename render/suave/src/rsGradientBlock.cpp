@@ -29,22 +29,21 @@ void RsGradientBlock::setUpDegenerate() {
         _dy0 = _dy1 = _dy2 = 0.0;
         return;
     }
+    // The rule of longest edge 0 or 1: e is the longest edge, n the one after it, p the one before.
+    const auto alongEdge = [](double& dxE, double& dyE, double& dxN, double& dyN, double& dxP, double& dyP) {
+        dyN = reciprocal(dxE);
+        dyP = -dyN;
+        dxP = reciprocal(dyE);
+        dxN = -dxP;
+        dxE = 0.0;
+        dyE = 0.0;
+    };
     switch (longest) {
     case 0:
-        _dy1 = reciprocal(_dx0);
-        _dy2 = -_dy1;
-        _dx2 = reciprocal(_dy0);
-        _dx1 = -_dx2;
-        _dx0 = 0.0;
-        _dy0 = 0.0;
+        alongEdge(_dx0, _dy0, _dx1, _dy1, _dx2, _dy2);
         break;
     case 1:
-        _dy2 = reciprocal(_dx1);
-        _dy0 = -_dy2;
-        _dx0 = reciprocal(_dy1);
-        _dx2 = -_dx0;
-        _dx1 = 0.0;
-        _dy1 = 0.0;
+        alongEdge(_dx1, _dy1, _dx2, _dy2, _dx0, _dy0);
         break;
     default:
         _dy0 = reciprocal(_dx2);

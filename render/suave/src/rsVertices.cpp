@@ -1,50 +1,47 @@
 #include "rsVertices.h"
 
+#include "rsVertexAttributes.h"
+
 namespace Zr {
 
-void RsDepthVertex::dump(std::ostream& os) const {
+namespace {
+
+// Prints the members that a 3D vertex kind has, in the order of its declaration.
+template <class V>
+void dumpVertex(const V& v, std::ostream& os) {
     os << " _pixCoord: ";
-    _pixCoord.dump(os);
-    os << " _eyeZ: " << _eyeZ << " _w: " << _w;
+    v._pixCoord.dump(os);
+    if constexpr (RsHasEyeCoord<V>) {
+        os << " _eyeCoord: ";
+        v._eyeCoord.dump(os);
+    }
+    if constexpr (RsHasEyeZ<V>) os << " _eyeZ: " << v._eyeZ;
+    if constexpr (RsHasNormal<V>) {
+        os << " _normal: ";
+        v._normal.dump(os);
+    }
+    if constexpr (RsHasTangentFrame<V>) {
+        os << " _binormal: ";
+        v._binormal.dump(os);
+        os << " _tangent: ";
+        v._tangent.dump(os);
+    }
+    if constexpr (RsHasTexCoord<V>) {
+        os << " _texCoord: ";
+        v._texCoord.dump(os);
+    }
+    os << " _w: " << v._w;
 }
 
-void RsPlainVertex::dump(std::ostream& os) const {
-    os << " _pixCoord: ";
-    _pixCoord.dump(os);
-    os << " _eyeCoord: ";
-    _eyeCoord.dump(os);
-    os << " _texCoord: ";
-    _texCoord.dump(os);
-    os << " _w: " << _w;
-}
+}  // namespace
 
-void RsNormalVertex::dump(std::ostream& os) const {
-    os << " _pixCoord: ";
-    _pixCoord.dump(os);
-    os << " _eyeCoord: ";
-    _eyeCoord.dump(os);
-    os << " _normal: ";
-    _normal.dump(os);
-    os << " _texCoord: ";
-    _texCoord.dump(os);
-    os << " _w: " << _w;
-}
+void RsDepthVertex::dump(std::ostream& os) const { dumpVertex(*this, os); }
 
-void RsTangentVertex::dump(std::ostream& os) const {
-    os << " _pixCoord: ";
-    _pixCoord.dump(os);
-    os << " _eyeCoord: ";
-    _eyeCoord.dump(os);
-    os << " _normal: ";
-    _normal.dump(os);
-    os << " _binormal: ";
-    _binormal.dump(os);
-    os << " _tangent: ";
-    _tangent.dump(os);
-    os << " _texCoord: ";
-    _texCoord.dump(os);
-    os << " _w: " << _w;
-}
+void RsPlainVertex::dump(std::ostream& os) const { dumpVertex(*this, os); }
+
+void RsNormalVertex::dump(std::ostream& os) const { dumpVertex(*this, os); }
+
+void RsTangentVertex::dump(std::ostream& os) const { dumpVertex(*this, os); }
 
 void Rs2DVertex::dump(std::ostream& os) const { os << " _x: " << _x << " _y: " << _y; }
 
