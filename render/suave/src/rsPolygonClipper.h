@@ -55,7 +55,8 @@ public:
 
     // Clips the polygon against the active planes; returns the number of its vertices left.
     int clip() {
-        if (_clipFlags == 0) return getVertexCount();
+        // A polygon inside every active plane comes out as it went in, and most are.
+        if (isInside()) return getVertexCount();
         static constexpr unsigned int order[6] = {zMinBit, zMaxBit, xMinBit, xMaxBit, yMinBit, yMaxBit};
         for (int plane = 0; plane < 6; ++plane) {
             if ((_clipFlags & order[plane]) == 0) continue;
@@ -75,6 +76,16 @@ public:
                 return true;
         }
         return false;
+    }
+
+    // True when every vertex of the polygon lies inside every active plane (a value of at least 0).
+    bool isInside() const {
+        for (unsigned int bit = 1; bit <= allPlanes; bit <<= 1) {
+            if ((_clipFlags & bit) == 0) continue;
+            for (int index : _polygon)
+                if (!(valueOf(_vertices[static_cast<std::size_t>(index)], bit) >= 0.0)) return false;
+        }
+        return true;
     }
 
     int getVertexCount() const { return static_cast<int>(_polygon.size()); }
