@@ -1,7 +1,11 @@
 // Whole render calls of RsRenderer on the fragment Z-buffer path: the sample scene of zrender,
-// a mesh of about 100,000 small triangles, and ten transparent layers over the whole picture.
-// Each reports megapixels and fragments (shaded surface samples) per second.
+// a mesh of about 100,000 small triangles, one quad over the same picture (the grid's time minus
+// the quad's, over 100,352, is the cost of one triangle), and ten transparent layers over the
+// whole picture. Each reports megapixels and fragments (shaded surface samples) per second, and
+// the process's peak resident memory so far (run one benchmark per process to read it per scene).
 #include <benchmark/benchmark.h>
+
+#include <sys/resource.h>
 
 #include <cstdint>
 #include <vector>
@@ -56,6 +60,9 @@ void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const R
     state.counters["Mpixels/s"] = benchmark::Counter(megapixels, benchmark::Counter::kIsIterationInvariantRate);
     state.counters["fragments/s"] = benchmark::Counter(static_cast<double>(fragments - fragmentsBefore),
                                                        benchmark::Counter::kIsRate, benchmark::Counter::OneK::kIs1000);
+    rusage usage{};
+    getrusage(RUSAGE_SELF, &usage);
+    state.counters["peakMiB"] = static_cast<double>(usage.ru_maxrss) / 1024.0;
 }
 
 void BM_SampleScene(benchmark::State& state) {
@@ -64,19 +71,25 @@ void BM_SampleScene(benchmark::State& state) {
     renderLoop(state, scene, ZrSampleScene::makeCamera(static_cast<int>(state.range(0)), static_cast<int>(state.range(1))),
                fragments);
 }
-BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
-// A square of 224 by 224 cells, two triangles each (100,352 triangles), facing the camera and
-// filling the picture: about 2.6 pixels per triangle at 512 by 512.
-void BM_SmallTriangles(benchmark::State& state) {
+// A square of cells by cells cells, two triangles each, facing the camera and filling the picture.
+void renderGrid(benchmark::State& state, int cells) {
     std::uint64_t fragments = 0;
     const RCShdPtr<RsScene> scene = ZrSceneKit::makeScene({ZrSceneKit::makeInstance(
-        ZrShapes::makeGrid(10.0f, 224, false), {ZrSceneKit::makeMaterial({0.6f, 0.7f, 0.8f})},
+        ZrShapes::makeGrid(10.0f, cells, false), {ZrSceneKit::makeMaterial({0.6f, 0.7f, 0.8f})},
         ZrSceneKit::makePlacement({0, 0, 0}, {1, 0, 0}, 90.0), countingShaders(fragments))});
     const double aspect = static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
     renderLoop(state, scene, ZrSceneKit::makeCamera({0, 0, 12}, {0, 0, 0}, 40.0, aspect, 1.0f, 100.0f), fragments);
 }
-BENCHMARK(BM_SmallTriangles)->Args({512, 512})->Unit(benchmark::kMillisecond);
+
+// 224 by 224 cells: 100,352 triangles, about 2.6 pixels each at 512 by 512.
+void BM_SmallTriangles(benchmark::State& state) { renderGrid(state, 224); }
+BENCHMARK(BM_SmallTriangles)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
+
+// The same square as one quad: the same pixels, two triangles.
+void BM_OneQuad(benchmark::State& state) { renderGrid(state, 1); }
+BENCHMARK(BM_OneQuad)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 // Ten squares one behind the other, each larger than the view, of opacity 0.3: every pixel
 // composites ten fragments.
@@ -94,7 +107,7 @@ void BM_TransparentLayers(benchmark::State& state) {
     const double aspect = static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
     renderLoop(state, scene, ZrSceneKit::makeCamera({0, 0, 10}, {0, 0, 0}, 40.0, aspect, 1.0f, 100.0f), fragments);
 }
-BENCHMARK(BM_TransparentLayers)->Args({512, 512})->Args({1920, 1080})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_TransparentLayers)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 }  // namespace
 
