@@ -50,18 +50,22 @@ void fill(Rgba* begin, Rgba* end, const Rgba& colour) {
     for (Rgba* p = begin; p < end; ++p) *p = colour;
 }
 
-// Lays each pixel's fragments over its start colour and finishes it.
+// Lays each pixel's fragments over its start colour and finishes it. The transfer functions take
+// the colour by reference, which pins it to memory; the finishing works on a copy in registers, so
+// that the row is not written and read back in pieces of different sizes.
 void compositeRow(Rgba* row, int width, RsFragment* const* lists, bool scale, float weight,
                   bool unpremultiply) {
     for (int i = 0; i < width; ++i) {
-        Rgba pixel = row[i];
-        pixel.r *= pixel.a;
-        pixel.g *= pixel.a;
-        pixel.b *= pixel.a;
-        for (const RsFragment* f = lists[i]; f != nullptr; f = f->_next) {
-            Rgba result(0.0f, 0.0f, 0.0f, 1.0f);
-            f->_transfer(f->_color, pixel, result);
-            pixel = result;
+        const Rgba start = row[i];
+        Rgba pixel(start.r * start.a, start.g * start.a, start.b * start.a, start.a);
+        if (const RsFragment* f = lists[i]) {
+            Rgba composite = pixel;
+            for (; f != nullptr; f = f->_next) {
+                Rgba result(0.0f, 0.0f, 0.0f, 1.0f);
+                f->_transfer(f->_color, composite, result);
+                composite = result;
+            }
+            pixel = Rgba(composite.r, composite.g, composite.b, composite.a);
         }
         if (scale) pixel *= weight;
         if (unpremultiply) {
