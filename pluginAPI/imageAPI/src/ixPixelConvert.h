@@ -57,11 +57,12 @@ public:
     static float byteToFloat(std::uint8_t v) { return static_cast<float>(v) * BYTE_TO_FLOAT; }
 
     // Rounds v * 255 to the nearest byte, clamped to 0..255. NaN gives 0.
+    // Written as two selections rather than branches, so that a row converts without jumps.
     static std::uint8_t floatToByte(float v) {
         const float scaled = v * 255.0f + 0.5f;
-        if (!(scaled > 0.0f)) return 0;
-        if (scaled >= 255.0f) return 255;
-        return static_cast<std::uint8_t>(scaled);
+        const float low = scaled > 0.0f ? scaled : 0.0f;
+        const float clamped = low < 255.0f ? low : 255.0f;
+        return static_cast<std::uint8_t>(static_cast<int>(clamped));
     }
 };
 
