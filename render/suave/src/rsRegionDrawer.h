@@ -164,8 +164,11 @@ private:
     template <class V>
     void drawWireFaces(unsigned int first, unsigned int end, bool screenSpace, float wireSize) {
         RsPolygonClipper<V>& clipper = clipperFor<V>();
-        // A wire ring reaches beyond its face, so no block is skipped.
-        forEachFace(first, end, false, [&](const SdMesh::Face& face) {
+        // The ring's corners are the face's own or mixtures of them with weights in [0, 1], so the
+        // ring lies within its face and a block beside the region holds no ring that reaches it;
+        // only an eye-space ring of negative size grows outwards, and then every face is tried.
+        const bool ringsInsideFaces = screenSpace || !(wireSize < 0.0f);
+        forEachFace(first, end, ringsInsideFaces, [&](const SdMesh::Face& face) {
             V ring[6]{};
             if (!prepareFace(face, ring)) return;
             ring[3] = ring[0];
