@@ -8,4 +8,7 @@ build="${1:-$root/build/opt}"
 golden="$root/tools/zrender/golden"
 "$build/tools/zrender" --size 96x72 -o "$golden/sample-96x72.png"
 "$build/tools/zrender" --size 96x72 --no-zbuffer -o "$golden/sample-96x72-no-zbuffer.png"
-echo "wrote $golden/sample-96x72.png and $golden/sample-96x72-no-zbuffer.png"
+# Large enough for eight regions, so that what crosses region borders is compared too.
+"$build/tools/zrender" --size 400x300 -o "$golden/sample-400x300.png"
+"$build/tools/zrender" --size 400x300 --no-zbuffer -o "$golden/sample-400x300-no-zbuffer.png"
+echo "wrote the four pictures sample-*.png in $golden"
