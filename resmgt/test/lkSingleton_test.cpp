@@ -1,0 +1,167 @@
+// The typed singleton through its whole life, with faults only a peer can plant, and the memory
+// singleton's aligned blocks.
+#include "lkSingleton.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cstdint>
+#include <cstdio>
+#include <cstring>
+#include <latch>
+#include <new>
+#include <set>
+#include <thread>
+#include <vector>
+
+#include "exBase.h"
+#include "osMemoryArch.h"
+
+namespace Zr {
+
+// Puts a singleton back to its first state, and into states only a fault produces.
+template <class T>
+struct LkSingletonTestPeer {
+    static void set(int state, T* pointee) { LkSingleton<T>::_state.store(state), LkSingleton<T>::_pointee = pointee; }
+    static LkLock* getInitLock() { return LkSingleton<T>::_initLock.load(); }
+    static void restart() {
+        delete LkSingleton<T>::_initLock.exchange(nullptr);
+        set(LkSingletonBase::UNINITIALIZED, nullptr);
+    }
+};
+
+namespace {
+
+// Counts constructions and destructions; the constructor yields so that racing threads overlap.
+struct RaceObject {
+    static inline std::atomic<int> made{0}, deleted{0};
+    RaceObject() {
+        ++made;
+        for (int i = 0; i < 20; ++i) std::this_thread::yield();
+    }
+    ~RaceObject() { ++deleted; }
+};
+
+TEST(LkSingleton, ThreadsRacingTheFirstDemandMakeOneObjectAndKeepOneLock) {
+    using Peer = LkSingletonTestPeer<RaceObject>;
+    LkSingletonDestroyer<RaceObject>::destroy();  // makes the destroyer's own lock before counting
+    for (int round = 0; round < 30; ++round) {
+        Peer::restart();
+        RaceObject::made = 0;
+        RaceObject::deleted = 0;
+        const int locksBefore = LkLockWindows::getLiveCount();
+        std::latch start(8);
+        std::vector<RaceObject*> seen(8, nullptr);
+        std::vector<std::thread> threads;
+        for (int t = 0; t < 8; ++t)
+            threads.emplace_back([&, t] { start.arrive_and_wait(), seen[t] = LkSingleton<RaceObject>::getInstance(); });
+        for (std::thread& t : threads) t.join();
+        EXPECT_EQ(RaceObject::made.load(), 1) << "round " << round;
+        ASSERT_NE(seen[0], nullptr);
+        for (RaceObject* p : seen) EXPECT_EQ(p, seen[0]) << "round " << round;
+        EXPECT_EQ(LkLockWindows::getLiveCount(), locksBefore + 1) << "round " << round;
+        ASSERT_NE(Peer::getInitLock(), nullptr);
+        EXPECT_STREQ(Peer::getInitLock()->getName(), "LkSingleton init lock");
+        LkSingletonDestroyer<RaceObject>::destroy();
+        EXPECT_EQ(RaceObject::deleted.load(), 1) << "round " << round;
+    }
+}
+
+struct LifeProbe {
+    static inline int made = 0, deleted = 0;
+    LifeProbe() { ++made; }
+    ~LifeProbe() { ++deleted; }
+};
+
+// Each state with its name and invariants; destroyed stays destroyed, answering null.
+TEST(LkSingleton, LifeRunsThroughTheThreeStatesAndEndsWithNull) {
+    using S = LkSingleton<LifeProbe>;
+    const auto expectState = [](int state, const char* name) {
+        EXPECT_EQ(S::getState(), state);
+        EXPECT_STREQ(S::getStateName(), name);
+        EXPECT_NO_THROW(S::checkClassInvariants());
+    };
+    expectState(LkSingletonBase::UNINITIALIZED, "UNINITIALIZED");
+    LifeProbe* first = S::getInstance();
+    ASSERT_NE(first, nullptr);
+    S::initSingleton();
+    EXPECT_EQ(S::getInstance(), first);
+    EXPECT_EQ(LifeProbe::made, 1);
+    expectState(LkSingletonBase::INITIALIZED, "INITIALIZED");
+    LkSingletonDestroyer<LifeProbe>::destroy();
+    EXPECT_EQ(LifeProbe::deleted, 1);
+    expectState(LkSingletonBase::DESTROYED, "DESTROYED");
+    EXPECT_EQ(S::getInstance(), nullptr);
+    LkSingletonDestroyer<LifeProbe>::destroy();
+    EXPECT_EQ(LifeProbe::made * 10 + LifeProbe::deleted, 11);
+}
+
+struct InvariantProbe {};
+
+// States that only a fault could produce fail the invariants; an unknown state aborts. Allocation
+// that gives nothing fails and leaves the singleton uninitialized, free to try again.
+struct NoMemoryObject {
+    static void* operator new(std::size_t, const std::nothrow_t&) noexcept { return nullptr; }
+    static void operator delete(void* p) noexcept { ::operator delete(p); }
+};
+
+TEST(LkSingleton, BrokenStatesAndFailedAllocationsAreReported) {
+    using S = LkSingleton<InvariantProbe>;
+    InvariantProbe object;
+    const std::pair<int, InvariantProbe*> broken[] = {{LkSingletonBase::UNINITIALIZED, &object},
+                                                       {LkSingletonBase::INITIALIZED, nullptr},
+                                                       {LkSingletonBase::DESTROYED, &object}};
+    for (const auto& [state, pointee] : broken) {
+        LkSingletonTestPeer<InvariantProbe>::set(state, pointee);
+        EXPECT_THROW(S::checkClassInvariants(), ExAssertionFailed) << state;
+    }
+    for (int unknown : {3, -1}) {
+        LkSingletonTestPeer<InvariantProbe>::set(unknown, nullptr);
+        EXPECT_THROW(S::checkClassInvariants(), ExProgramAborted);
+        EXPECT_THROW(S::getStateName(), ExProgramAborted);
+    }
+    LkSingletonTestPeer<InvariantProbe>::restart();
+    EXPECT_NO_THROW(S::checkClassInvariants());
+    for (int attempt = 0; attempt < 2; ++attempt) {
+        EXPECT_THROW(LkSingleton<NoMemoryObject>::getInstance(), ExAssertionFailed);
+        EXPECT_EQ(LkSingleton<NoMemoryObject>::getState(), LkSingletonBase::UNINITIALIZED);
+    }
+}
+
+// At exit the later-made singleton ends first, so one that used another while being built can
+// still use it while being destroyed.
+struct InnerAtExit {
+    ~InnerAtExit() { std::fputs("inner destroyed\n", stderr); }
+};
+struct OuterAtExit {
+    OuterAtExit() { (void)LkSingleton<InnerAtExit>::getInstance(); }
+    ~OuterAtExit() {
+        std::fputs(LkSingleton<InnerAtExit>::getInstance() ? "outer destroyed, inner alive\n" : "inner gone\n", stderr);
+    }
+};
+
+TEST(LkSingletonDeathTest, ExitDestroysSingletonsInReverseOrderOfMaking) {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    EXPECT_EXIT((void)LkSingleton<OuterAtExit>::getInstance(); std::exit(0), ::testing::ExitedWithCode(0),
+                "outer destroyed, inner alive\ninner destroyed");
+}
+
+TEST(OsMemoryArch, BlocksAreAlignedToAPowerOfTwoDistinctAndUsable) {
+    OsMemoryArch* arch = OsMemoryArch::getInstance();
+    ASSERT_NE(arch, nullptr);
+    const auto alignment = static_cast<std::uintptr_t>(arch->getAlignment());
+    EXPECT_GE(alignment, 16u);  // at least a whole float RGBA colour
+    EXPECT_EQ(alignment & (alignment - 1), 0u);
+    std::set<void*> blocks;
+    for (std::size_t bytes : {0u, 1u, 3u, 64u, 65u, 1000u, 1u << 20}) {
+        void* block = OsMemoryArch::allocate(bytes);
+        EXPECT_EQ(reinterpret_cast<std::uintptr_t>(block) % alignment, 0u) << bytes;
+        std::memset(block, 0x5a, bytes);  // the sanitizer checks the whole block is ours
+        EXPECT_TRUE(blocks.insert(block).second);
+    }
+    for (void* block : blocks) OsMemoryArch::release(block);
+    OsMemoryArch::release(nullptr);
+}
+
+}  // namespace
+}  // namespace Zr
