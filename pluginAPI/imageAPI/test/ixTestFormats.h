@@ -36,15 +36,17 @@ inline Rgba presentChannels(const Rgba& c, IxPixelFormat::Comps comps) {
     return c;
 }
 
-// Compares within the error a channel of the depth may add to a value within 0..1.
-inline void expectNear(const Rgba& got, const Rgba& want, IxPixelFormat::Depth depth) {
-    const float tolerance = depth == IxPixelFormat::UINT8    ? 0.5f / 255.0f + 1e-6f
-                            : depth == IxPixelFormat::FLOAT16 ? 1.0f / 2048.0f
-                                                              : 0.0f;
+inline void expectNear(const Rgba& got, const Rgba& want, float tolerance) {
     EXPECT_NEAR(got.r, want.r, tolerance);
     EXPECT_NEAR(got.g, want.g, tolerance);
     EXPECT_NEAR(got.b, want.b, tolerance);
     EXPECT_NEAR(got.a, want.a, tolerance);
+}
+
+// Compares within the error a channel of the depth may add to a value within 0..1.
+inline void expectNear(const Rgba& got, const Rgba& want, IxPixelFormat::Depth depth) {
+    const bool byte = depth == IxPixelFormat::UINT8, half = depth == IxPixelFormat::FLOAT16;
+    expectNear(got, want, byte ? 0.5f / 255.0f + 1e-6f : half ? 1.0f / 2048.0f : 0.0f);
 }
 
 }  // namespace Zr::IxTestFormats
