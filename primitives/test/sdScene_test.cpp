@@ -1,5 +1,5 @@
-// Instances and scenes: cyclic materials, sorting instances into the scene's lists, and the
-// lifetime of everything a scene holds.
+// Instances and scenes: cyclic materials, sorting instances into the scene's lists, the lifetime of
+// everything a scene holds, and the run-time types of the described classes.
 #include <gtest/gtest.h>
 
 #include <random>
@@ -20,96 +20,112 @@ TEST(SdInstance, FaceGroupsTakeMaterialsCyclically) {
     for (unsigned int count = 1; count <= 5; ++count) {
         SdInstance instance;
         std::vector<RCShdPtr<const SdMaterial>> materials;
-        for (unsigned int i = 0; i < count; ++i) {
-            materials.push_back(makeShared<SdMaterial>());
-            instance.addMaterial(materials.back());
-        }
+        for (unsigned int i = 0; i < count; ++i) instance.addMaterial(materials.emplace_back(makeShared<SdMaterial>()));
         ASSERT_EQ(instance.getMaterialCount(), count);
-        // Near groups one by one and far groups at random, against the remainder.
-        std::uniform_int_distribution<unsigned int> far(0, 0xffffffffu);
-        for (unsigned int k = 0; k < 3 * count + 22; ++k) {
-            const unsigned int g = k < 3 * count + 2 ? k : far(rng);
+        for (unsigned int k = 0; k < 3 * count + 22; ++k) {  // near groups one by one, far ones at random
+            const unsigned int g = k < 3 * count + 2 ? k : static_cast<unsigned int>(rng());
             EXPECT_EQ(instance.getMaterialOfGroup(g).get(), materials[g % count].get()) << g;
         }
     }
     EXPECT_THROW(SdInstance().getMaterialOfGroup(0), ExAssertionFailed);
 }
 
-TEST(SdScene, AddSortsInstancesByTheKindOfTheirObject) {
-    SdScene scene;
-    RCShdPtr<SdInstance> camera = makeShared<SdInstance>(makeShared<SdCamera>());
-    RCShdPtr<SdInstance> light1 = makeShared<SdInstance>(makeShared<SdStdLight>());
-    RCShdPtr<SdInstance> geometry = makeShared<SdInstance>(makeShared<SdMeshGeometry>());
-    RCShdPtr<SdInstance> light2 = makeShared<SdInstance>(makeShared<SdStdLight>());
-    for (const RCShdPtr<SdInstance>& instance : {camera, light1, geometry, light2}) scene.add(instance);
-
-    ASSERT_EQ(scene.getGeometry().size(), 1u);
-    ASSERT_EQ(scene.getCameras().size(), 1u);
-    ASSERT_EQ(scene.getLights().size(), 2u);
-    EXPECT_EQ(scene.getGeometry()[0], geometry);
-    EXPECT_EQ(scene.getCameras()[0], camera);
-    EXPECT_EQ(scene.getLights()[0], light1);  // in the order added
-    EXPECT_EQ(scene.getLights()[1], light2);
-
-    // Neither an empty instance nor one holding a material belongs to a list.
-    EXPECT_THROW(scene.add(makeShared<SdInstance>()), ExAssertionFailed);
-    EXPECT_THROW(scene.add(makeShared<SdInstance>(makeShared<SdMaterial>())), ExAssertionFailed);
-    EXPECT_EQ(scene.getGeometry().size() + scene.getCameras().size() + scene.getLights().size(), 4u);
-}
-
 // Counts the live objects of the classes below, to see that nothing outlives the last reference.
 int liveObjects = 0;
 
-class CountedMaterial : public SdMaterial {
-public:
+struct CountedMaterial : SdMaterial {
     CountedMaterial() { ++liveObjects; }
     ~CountedMaterial() override { --liveObjects; }
 };
-class CountedGeometry : public SdMeshGeometry {
-public:
+struct CountedGeometry : SdMeshGeometry {
     explicit CountedGeometry(RCShdPtr<const SdMesh> mesh) : SdMeshGeometry(std::move(mesh)) { ++liveObjects; }
     ~CountedGeometry() override { --liveObjects; }
 };
-class CountedLight : public SdStdLight {
-public:
+struct CountedLight : SdStdLight {
     CountedLight() { ++liveObjects; }
     ~CountedLight() override { --liveObjects; }
 };
 
-TEST(SdScene, ReleasesEverythingWithTheLastReference) {
-    RCShdPtr<const SdMesh> mesh =
-        SdMeshBuilder().setVertices({{0, 0, 0}, {1, 0, 0}, {0, 1, 0}}).setTriangles({0, 1, 2}).build();
+// Instances go to the list of their object's kind in the order added; the scene holds them, and
+// they their objects and materials, until the last reference goes.
+TEST(SdScene, AddSortsInstancesByKindAndReleasesEverythingWithTheLastReference) {
+    const RCShdPtr<const SdMesh> mesh = SdMeshBuilder().setVertices({{0, 0, 0}, {1, 0, 0}, {0, 1, 0}}).build();
     RCShdPtr<const SdMaterial> shared(new CountedMaterial);
     {
         RCShdPtr<SdScene> scene = makeShared<SdScene>();
+        const auto camera = makeShared<SdInstance>(makeShared<SdCamera>());
+        const auto light = makeShared<SdInstance>(RCShdPtr<SdObject>(new CountedLight));
+        const auto light2 = makeShared<SdInstance>(makeShared<SdStdLight>());
+        std::vector<RCShdPtr<SdInstance>> geometry;
         for (int i = 0; i < 3; ++i) {
-            RCShdPtr<SdInstance> instance = makeShared<SdInstance>(RCShdPtr<SdObject>(new CountedGeometry(mesh)));
-            instance->addMaterial(shared);
-            instance->addMaterial(RCShdPtr<const SdMaterial>(new CountedMaterial));
-            scene->addGeometry(instance);
+            geometry.push_back(makeShared<SdInstance>(RCShdPtr<SdObject>(new CountedGeometry(mesh))));
+            geometry.back()->addMaterial(shared);
+            geometry.back()->addMaterial(RCShdPtr<const SdMaterial>(new CountedMaterial));
         }
-        RCShdPtr<SdInstance> light = makeShared<SdInstance>(RCShdPtr<SdObject>(new CountedLight));
-        scene->addLight(light);
+        for (const auto& instance : {camera, geometry[0], light, geometry[1], light2, geometry[2]})
+            scene->add(instance);
+        EXPECT_EQ(scene->getGeometry(), geometry);
+        EXPECT_EQ(scene->getCameras(), (SdScene::InstanceList{camera}));
+        EXPECT_EQ(scene->getLights(), (SdScene::InstanceList{light, light2}));
+        // Neither an empty instance nor one holding a material belongs to a list.
+        EXPECT_THROW(scene->add(makeShared<SdInstance>()), ExAssertionFailed);
+        EXPECT_THROW(scene->add(makeShared<SdInstance>(makeShared<SdMaterial>())), ExAssertionFailed);
+        EXPECT_EQ(scene->getGeometry().size() + scene->getCameras().size() + scene->getLights().size(), 6u);
         EXPECT_EQ(liveObjects, 1 + 3 * 2 + 1);
-        // One reference from the test, one from each instance.
-        EXPECT_EQ(shared->getReferenceCount(), 4);
+        EXPECT_EQ(shared->getReferenceCount(), 4);  // the test's and one from each instance
         EXPECT_EQ(mesh->getReferenceCount(), 4);
-        EXPECT_EQ(light->getReferenceCount(), 2);
-
-        // An instance kept beyond the scene keeps its own objects alive, as does the light
-        // instance still held here.
-        RCShdPtr<SdInstance> kept = scene->getGeometry()[1];
-        scene = nullptr;
+        const RCShdPtr<SdInstance> kept = geometry[1];
+        geometry.clear();
+        scene = nullptr;  // an instance kept beyond the scene keeps its own objects alive
         EXPECT_EQ(liveObjects, 1 + 2 + 1);
-        EXPECT_EQ(light->getReferenceCount(), 1);
-        EXPECT_EQ(shared->getReferenceCount(), 2);
-        EXPECT_EQ(kept->getReferenceCount(), 1);
+        EXPECT_EQ(light->getReferenceCount() + shared->getReferenceCount() + kept->getReferenceCount(), 4);
     }
     EXPECT_EQ(liveObjects, 1);
-    EXPECT_EQ(shared->getReferenceCount(), 1);
-    EXPECT_EQ(mesh->getReferenceCount(), 1);
+    EXPECT_EQ(shared->getReferenceCount() + mesh->getReferenceCount(), 2);
     shared = nullptr;
     EXPECT_EQ(liveObjects, 0);
+}
+
+// A host's own material and light, registered under their own types.
+struct GlassMaterial : SdMaterial {
+    using RttiClassType = RttiGenType1<GlassMaterial, SdMaterial>;
+    const RttiType<SdMaterial>& getType() const override { return RttiClassType::getInstance(); }
+};
+struct AreaLight : SdLight {
+    using RttiClassType = RttiGenType1<AreaLight, SdLight>;
+    const RttiType<SdObject>& getType() const override { return RttiClassType::getInstance(); }
+};
+
+// Each class answers its own type, whose ancestors follow the class hierarchy; materials root a
+// hierarchy of their own, and a type is found in its hierarchy by a checked cast.
+TEST(SdTypes, EachClassAnswersItsTypeWithItsAncestors) {
+    const RttiTypeBase* object = &SdObject::RttiClassType::getInstance();
+    const RttiTypeBase* light = &SdLight::RttiClassType::getInstance();
+    const RttiTypeBase* material = &SdMaterial::RttiClassType::getInstance();
+    const RttiTypeBase* geometry = &SdGeometry::RttiClassType::getInstance();
+    const struct {
+        RCShdPtr<const SdObject> instance;
+        const RttiTypeBase* type;
+        std::vector<const RttiTypeBase*> ancestors;
+    } cases[] = {
+        {makeShared<SdStdLight>(), &SdStdLight::RttiClassType::getInstance(), {light, object}},
+        {makeShared<AreaLight>(), &AreaLight::RttiClassType::getInstance(), {light, object}},
+        {makeShared<SdCamera>(), &SdCamera::RttiClassType::getInstance(), {object}},
+        {makeShared<SdMeshGeometry>(), &SdMeshGeometry::RttiClassType::getInstance(), {geometry, object}},
+        {makeShared<SdTexture>(), &SdTexture::RttiClassType::getInstance(), {object}},
+        {SdMeshBuilder().build(), &SdMesh::RttiClassType::getInstance(), {object}},
+        {makeShared<SdMaterial>(), material, {}},
+        {makeShared<GlassMaterial>(), &GlassMaterial::RttiClassType::getInstance(), {material}},
+    };
+    for (const auto& c : cases) {
+        const RttiTypeBase& type = c.instance->getType();
+        std::vector<const RttiTypeBase*> ancestors;
+        for (ConstIterator<RttiTypeBase*> it = type.getAncestors(); !it.atEnd(); ++it) ancestors.push_back(*it);
+        EXPECT_EQ(&type, c.type) << type.getName();
+        EXPECT_EQ(ancestors, c.ancestors) << type.getName();
+    }
+    EXPECT_EQ(&RttiType<SdObject>::cast(cases[0].instance->getType()), cases[0].type);
+    EXPECT_THROW(RttiType<SdMaterial>::cast(cases[0].instance->getType()), ExCastFailed);
 }
 
 }  // namespace
