@@ -10,6 +10,8 @@ namespace Zr {
 
 namespace {
 
+constexpr const char* kSourceFile = "render\\suave\\src\\rsInstanceVertices";
+
 GeVector3<float> normalizedOrSame(const GeVector3<float>& v) {
     const float length = v.length();
     return length != 0.0f ? v / length : v;
@@ -23,7 +25,7 @@ RsInstanceVertices::RsInstanceVertices(const RsGeomInstance& instance,
     : _mesh(instance._mesh) {
     const SdMesh& mesh = *_mesh;
     // The scene builder completes every mesh with its normals and face normals.
-    ZR_ASSERT_AT(mesh.hasDerivedData(), "render\\suave\\src\\rsInstanceVertices", __LINE__);
+    ZR_ASSERT_AT(mesh.hasDerivedData(), kSourceFile, __LINE__);
     _hasTexCoords = mesh.getTextureCoordinateCount() != 0 && mesh.getTextureFaces() != nullptr;
 
     const GeAffineMatrix3<float>& toCamera = instance._toCamera;

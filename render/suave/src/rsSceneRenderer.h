@@ -5,7 +5,8 @@
 // A region whose area is within the factory's getMaxArea is drawn as one; a larger one is cut into
 // four at its middle, recursively. Each quadrant is grown by the factory's kernel size towards the
 // middle, so that with a filter the quadrants overlap by twice that and each holds the fragments
-// that its filter footprint reads. One region's buffer exists at a time: it is created, every
+// that its filter footprint reads. The instances' vertex data is made once, before the first
+// region (rsInstanceVertices.h). One region's buffer exists at a time: it is created, every
 // instance of the list is drawn into it, it is finalised into the output and released before the
 // next region starts.
 #include <ostream>
@@ -122,7 +123,8 @@ private:
         const RsGeomInstance::MaterialList& materials = geom._materials;
         const std::size_t materialCount = materials.size();
         // Face group g takes material g modulo the count, which needs a material.
-        ZR_ASSERT_AT(groups == 0 || materialCount != 0, "render\\suave\\src\\rsSceneRenderer", __LINE__);
+        constexpr const char* kSourceFile = "render\\suave\\src\\rsSceneRenderer";
+        ZR_ASSERT_AT(groups == 0 || materialCount != 0, kSourceFile, __LINE__);
         drawer.setInstance(geom, vertices, true);
         for (unsigned int g = 0; g < groups; ++g) {
             const SdMeshTypes::FaceGroup& group = mesh.getFaceGroup(g);
