@@ -114,13 +114,42 @@ void RsInstanceVertices::computeBlockBoxes() {
             bounded = true;
         }
     }
+    const std::size_t blocks = _blockBoxes.size();
+    _groupBoxes.resize((blocks + kBlocksPerGroup - 1) / kBlocksPerGroup);
+    for (std::size_t g = 0; g < _groupBoxes.size(); ++g) {
+        Box group{inf, -inf, inf, -inf};
+        for (std::size_t b = g * kBlocksPerGroup; b < std::min(blocks, (g + 1) * kBlocksPerGroup); ++b) {
+            const Box& block = _blockBoxes[b];
+            if (block.x0 > block.x1) {
+                group = Box{1.0, 0.0, 1.0, 0.0};
+                break;
+            }
+            group = {std::min(group.x0, block.x0), std::max(group.x1, block.x1), std::min(group.y0, block.y0),
+                     std::max(group.y1, block.y1)};
+        }
+        _groupBoxes[g] = group;
+    }
 }
 
-bool RsInstanceVertices::blockMisses(unsigned int b, const GeRectangle<int>& region) const {
-    const Box& box = _blockBoxes[b];
+unsigned int RsInstanceVertices::nextFaceNear(unsigned int face, unsigned int end,
+                                              const GeRectangle<int>& region) const {
+    constexpr unsigned int kFacesPerGroup = kFacesPerBlock * kBlocksPerGroup;
+    while (face < end) {
+        if (misses(_groupBoxes[face / kFacesPerGroup], region)) {
+            face = (face / kFacesPerGroup + 1) * kFacesPerGroup;
+        } else if (misses(_blockBoxes[face / kFacesPerBlock], region)) {
+            face = (face / kFacesPerBlock + 1) * kFacesPerBlock;
+        } else {
+            return face;
+        }
+    }
+    return end;
+}
+
+bool RsInstanceVertices::misses(const Box& box, const GeRectangle<int>& region) {
     if (box.x0 > box.x1) return false;
     // The clipper tests x - x0 * w < 0 on the undivided coordinates; the margin, far above the
-    // rounding of either form, makes sure that a block skipped here is one whose every vertex
+    // rounding of either form, makes sure that a box passed over here is one whose every vertex
     // fails that test.
     const auto margin = [](double limit) { return 1e-6 * (1.0 + std::fabs(limit)); };
     const double x0 = region.x0, x1 = region.x1, y0 = region.y0, y1 = region.y1;

@@ -5,7 +5,8 @@
 //
 // The pixel matrix is the same for every region of a call, so this is made once per instance and
 // render and shared by all regions; a region drawer then does only per-face work. The block
-// bounds let a region skip, before any per-face work, the runs of faces that lie wholly beside it.
+// bounds let a region skip, before any per-face work, the runs of faces that lie wholly beside it:
+// blocks of 32 faces, and groups of 16 blocks, so that a large mesh costs a region little.
 #include <vector>
 
 #include "geAffineMatrix3.h"
@@ -23,8 +24,9 @@ class RsGeomInstance;
 
 class RsInstanceVertices {
 public:
-    // Faces are bounded in runs of this many, in mesh order.
+    // Faces are bounded in runs of this many, in mesh order, and blocks in groups.
     static constexpr unsigned int kFacesPerBlock = 32;
+    static constexpr unsigned int kBlocksPerGroup = 16;
 
     // Transforms the vertices of the instance with its camera matrix and then pixelMatrix, and
     // its normals when withNormals is set; the tangent frames follow when withTangents is set or
@@ -43,11 +45,12 @@ public:
     // Computes the tangent frames unless they are there.
     void prepareTangents();
 
-    // True when every face of block b lies beside region by a safe margin, so that each of them
-    // has all three vertices strictly outside one side of the region and would be dropped by the
-    // clipper's outside test. False for a block with a vertex at or behind the eye or one that is
-    // not finite: its faces go to the per-face test.
-    bool blockMisses(unsigned int b, const GeRectangle<int>& region) const;
+    // The first face from face on, before end, whose block may reach region; end when there is
+    // none. Every face passed over lies beside the region by a safe margin: all three of its
+    // vertices are strictly outside one side of the region, so the clipper's outside test would
+    // drop it. A block with a vertex at or behind the eye, or one that is not finite, is never
+    // passed over: its faces go to the per-face test.
+    unsigned int nextFaceNear(unsigned int face, unsigned int end, const GeRectangle<int>& region) const;
 
 private:
     // The pixel-space box of a block after the division by w: x0, x1, y0, y1; empty (x0 > x1)
@@ -55,6 +58,8 @@ private:
     struct Box {
         double x0, x1, y0, y1;
     };
+
+    static bool misses(const Box& box, const GeRectangle<int>& region);
 
     void computeTangents();
     void computeBlockBoxes();
@@ -68,6 +73,7 @@ private:
     std::vector<GeVector3<float>> _tangentsU;
     std::vector<GeVector3<float>> _tangentsV;
     std::vector<Box> _blockBoxes;
+    std::vector<Box> _groupBoxes;  // each the union of its blocks' boxes, empty if one is
 };
 
 }  // namespace Zr

@@ -137,10 +137,12 @@ private:
         constexpr unsigned int block = RsInstanceVertices::kFacesPerBlock;
         unsigned int start = first;
         while (start < end) {
-            const unsigned int b = start / block;
-            const unsigned int stop = std::min(end, (b + 1) * block);
-            if (!(skipMisses && _vertices->blockMisses(b, _region)))
-                for (SdMesh::FaceConstIterator it(mesh.getFace(start)); it->getIndex() < stop; ++it) draw(*it);
+            if (skipMisses) {
+                start = _vertices->nextFaceNear(start, end, _region);
+                if (start >= end) return;
+            }
+            const unsigned int stop = std::min(end, (start / block + 1) * block);
+            for (SdMesh::FaceConstIterator it(mesh.getFace(start)); it->getIndex() < stop; ++it) draw(*it);
             start = stop;
         }
     }
