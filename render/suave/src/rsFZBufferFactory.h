@@ -27,6 +27,8 @@ public:
     // Depth test on, no output, not accumulating, weight 1, opaque black fill, no background, no
     // deep shadow map, unpremultiplied output.
     RsFZBufferFactory();
+    RsFZBufferFactory(const RsFZBufferFactory&) = delete;
+    RsFZBufferFactory& operator=(const RsFZBufferFactory&) = delete;
 
     int getKernelSize() const { return 0; }
     int getMaxArea() const { return kMaxArea; }
@@ -44,6 +46,9 @@ public:
     // the finished pixels.
     void setOutput(const IxWriteGuard& output, bool accumulate, float weight);
     void setOutput(RsDeepShadowMap& map) { _deepShadowMap = &map; }
+    // Where the buffers hand their arrays and pool on, from region to region: memory that outlives
+    // the factory carries them from one render to the next as well. Null for the factory's own.
+    void setMemory(RsFZBufferMemory* memory) { _memory = memory != nullptr ? memory : &_ownMemory; }
 
     bool getZBuffer() const { return _zBuffer; }
     bool getUnpremultiply() const { return _unpremultiply; }
@@ -66,7 +71,8 @@ private:
     RsDeepShadowMap* _deepShadowMap = nullptr;
     bool _unpremultiply = true;
     // Handed from each region's buffer to the next; the buffers die before the factory.
-    mutable RsFZBufferMemory _memory;
+    RsFZBufferMemory _ownMemory;
+    RsFZBufferMemory* _memory = &_ownMemory;
 };
 
 }  // namespace Zr

@@ -75,6 +75,8 @@ void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatr
     factory.setFillColor(_fillColor);
     factory.setBackground(_background);
     factory.setUnpremultiply(unpremultiply);
+    if (!_bufferMemory) _bufferMemory = std::make_unique<RsFZBufferMemory>();
+    factory.setMemory(_bufferMemory.get());
     renderWithFactory(factory, scene, _zBuffer, worldToCamera, projection, rectangle);
 }
 

@@ -8,6 +8,7 @@
 // A call draws the complete picture of its rectangle into the output guard's region and keeps
 // nothing afterwards: the buffer factory, the scene renderer and the list of visible instances
 // live on the call's stack. Settings take effect at the next call.
+#include <memory>
 #include <ostream>
 
 #include "coRgbaColorTyped.h"
@@ -24,6 +25,8 @@
 #include "sdInstance.h"
 
 namespace Zr {
+
+struct RsFZBufferMemory;
 
 class RsRenderer : public RCBase<LkCounter<int>>, public IxTileManip {
 public:
@@ -77,6 +80,8 @@ protected:
     RsFilterKernel _filterKernel{static_cast<RsFilterKernel::KernelType>(0)};
     CoRgbaColorTyped<float> _fillColor{0.0f, 0.0f, 0.0f, 0.0f};
     ReadGuardNoCheck _background;
+    // The fragment buffers' memory, kept from one render call to the next.
+    std::unique_ptr<RsFZBufferMemory> _bufferMemory;
 };
 
 }  // namespace Zr
