@@ -29,9 +29,9 @@
 #include "ixWriteGuard.h"
 #include "peer_gl.h"
 #include "rsRenderer.h"
+#include "zrBenchScenes.h"
 #include "zrSampleScene.h"
 #include "zrSceneKit.h"
-#include "zrShapes.h"
 
 namespace {
 
@@ -62,27 +62,16 @@ const std::vector<SceneCase>& sceneCases() {
         // 224 by 224 cells of two triangles (100,352 triangles) facing the camera.
         {"100k triangles",
          [](int width, int height) {
-             const RCShdPtr<RsScene> scene = ZrSceneKit::makeScene({ZrSceneKit::makeInstance(
-                 ZrShapes::makeGrid(10.0f, 224, false), {ZrSceneKit::makeMaterial({0.6f, 0.7f, 0.8f})},
-                 ZrSceneKit::makePlacement({0, 0, 0}, {1, 0, 0}, 90.0), ZrSceneKit::diffuseShaderMaker())});
-             return Scene{scene, ZrSceneKit::makeCamera({0, 0, 12}, {0, 0, 0}, 40.0, aspectOf(width, height),
-                                                        1.0f, 100.0f)};
+             const ZrBenchScene grid =
+                 ZrBenchScenes::makeGrid(224, aspectOf(width, height), ZrSceneKit::diffuseShaderMaker());
+             return Scene{grid.scene, grid.camera};
          }},
         // Ten squares one behind the other, each larger than the view, of opacity 0.3.
         {"10 layers",
          [](int width, int height) {
-             std::vector<RCShdPtr<RsGeomInstance>> layers;
-             const RCShdPtr<const SdMesh> square = ZrShapes::makeGrid(1.0f, 1, false);
-             for (int i = 0; i < 10; ++i) {
-                 const float shade = 0.1f * static_cast<float>(i);
-                 layers.push_back(ZrSceneKit::makeInstance(
-                     square, {ZrSceneKit::makeMaterial({shade, 0.5f, 1.0f - shade}, 0.3f)},
-                     ZrSceneKit::makePlacement({0, 0, -0.5 * i}, {1, 0, 0}, 90.0, 40.0),
-                     ZrSceneKit::diffuseShaderMaker()));
-             }
-             return Scene{ZrSceneKit::makeScene(std::move(layers)),
-                          ZrSceneKit::makeCamera({0, 0, 10}, {0, 0, 0}, 40.0, aspectOf(width, height), 1.0f,
-                                                 100.0f)};
+             const ZrBenchScene layers = ZrBenchScenes::makeLayers(aspectOf(width, height),
+                                                                    ZrSceneKit::diffuseShaderMaker());
+             return Scene{layers.scene, layers.camera};
          }},
     };
     return cases;

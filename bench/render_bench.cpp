@@ -13,10 +13,10 @@
 #include "ixTile.h"
 #include "ixWriteGuard.h"
 #include "rsRenderer.h"
+#include "zrBenchScenes.h"
 #include "zrDiffuseShader.h"
 #include "zrSampleScene.h"
 #include "zrSceneKit.h"
-#include "zrShapes.h"
 
 namespace {
 
@@ -73,39 +73,31 @@ void BM_SampleScene(benchmark::State& state) {
 }
 BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
-// A square of cells by cells cells, two triangles each, facing the camera and filling the picture.
-void renderGrid(benchmark::State& state, int cells) {
-    std::uint64_t fragments = 0;
-    const RCShdPtr<RsScene> scene = ZrSceneKit::makeScene({ZrSceneKit::makeInstance(
-        ZrShapes::makeGrid(10.0f, cells, false), {ZrSceneKit::makeMaterial({0.6f, 0.7f, 0.8f})},
-        ZrSceneKit::makePlacement({0, 0, 0}, {1, 0, 0}, 90.0), countingShaders(fragments))});
-    const double aspect = static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
-    renderLoop(state, scene, ZrSceneKit::makeCamera({0, 0, 12}, {0, 0, 0}, 40.0, aspect, 1.0f, 100.0f), fragments);
+double aspectOf(const benchmark::State& state) {
+    return static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
 }
 
 // 224 by 224 cells: 100,352 triangles, about 2.6 pixels each at 512 by 512.
-void BM_SmallTriangles(benchmark::State& state) { renderGrid(state, 224); }
+void BM_SmallTriangles(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    const ZrBenchScene grid = ZrBenchScenes::makeGrid(224, aspectOf(state), countingShaders(fragments));
+    renderLoop(state, grid.scene, grid.camera, fragments);
+}
 BENCHMARK(BM_SmallTriangles)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 // The same square as one quad: the same pixels, two triangles.
-void BM_OneQuad(benchmark::State& state) { renderGrid(state, 1); }
+void BM_OneQuad(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    const ZrBenchScene quad = ZrBenchScenes::makeGrid(1, aspectOf(state), countingShaders(fragments));
+    renderLoop(state, quad.scene, quad.camera, fragments);
+}
 BENCHMARK(BM_OneQuad)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
-// Ten squares one behind the other, each larger than the view, of opacity 0.3: every pixel
-// composites ten fragments.
+// Every pixel composites ten fragments.
 void BM_TransparentLayers(benchmark::State& state) {
     std::uint64_t fragments = 0;
-    std::vector<RCShdPtr<RsGeomInstance>> layers;
-    const RCShdPtr<const SdMesh> square = ZrShapes::makeGrid(1.0f, 1, false);
-    for (int i = 0; i < 10; ++i) {
-        const float shade = 0.1f * static_cast<float>(i);
-        layers.push_back(ZrSceneKit::makeInstance(
-            square, {ZrSceneKit::makeMaterial({shade, 0.5f, 1.0f - shade}, 0.3f)},
-            ZrSceneKit::makePlacement({0, 0, -0.5 * i}, {1, 0, 0}, 90.0, 40.0), countingShaders(fragments)));
-    }
-    const RCShdPtr<RsScene> scene = ZrSceneKit::makeScene(std::move(layers));
-    const double aspect = static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));
-    renderLoop(state, scene, ZrSceneKit::makeCamera({0, 0, 10}, {0, 0, 0}, 40.0, aspect, 1.0f, 100.0f), fragments);
+    const ZrBenchScene layers = ZrBenchScenes::makeLayers(aspectOf(state), countingShaders(fragments));
+    renderLoop(state, layers.scene, layers.camera, fragments);
 }
 BENCHMARK(BM_TransparentLayers)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
