@@ -73,18 +73,23 @@ void main() {
 
 OSMesaContext osmesa(void* context) { return static_cast<OSMesaContext>(context); }
 
+// Throws with GL's log when the status of a shader or program (its query and log functions given)
+// is not true.
+template <class GetStatus, class GetLog>
+void requireSuccess(GLuint object, GLenum status, GetStatus getStatus, GetLog getLog, const char* what) {
+    GLint ok = GL_FALSE;
+    getStatus(object, status, &ok);
+    if (ok == GL_TRUE) return;
+    char log[2048] = {};
+    getLog(object, sizeof log, nullptr, log);
+    throw std::runtime_error(std::string("peer: ") + what + ": " + log);
+}
+
 unsigned int compileShader(GLenum kind, const char* source) {
     const GLuint shader = glCreateShader(kind);
     glShaderSource(shader, 1, &source, nullptr);
     glCompileShader(shader);
-    GLint ok = GL_FALSE;
-    glGetShaderiv(shader, GL_COMPILE_STATUS, &ok);
-    if (ok != GL_TRUE) {
-        char log[2048] = {};
-        glGetShaderInfoLog(shader, sizeof log, nullptr, log);
-        glDeleteShader(shader);
-        throw std::runtime_error(std::string("peer: shader does not compile: ") + log);
-    }
+    requireSuccess(shader, GL_COMPILE_STATUS, glGetShaderiv, glGetShaderInfoLog, "shader does not compile");
     return shader;
 }
 
@@ -115,13 +120,7 @@ PeerContext::PeerContext() {
     glLinkProgram(_program);
     glDeleteShader(vertex);
     glDeleteShader(fragment);
-    GLint ok = GL_FALSE;
-    glGetProgramiv(_program, GL_LINK_STATUS, &ok);
-    if (ok != GL_TRUE) {
-        char log[2048] = {};
-        glGetProgramInfoLog(_program, sizeof log, nullptr, log);
-        throw std::runtime_error(std::string("peer: shader program does not link: ") + log);
-    }
+    requireSuccess(_program, GL_LINK_STATUS, glGetProgramiv, glGetProgramInfoLog, "shader program does not link");
     const auto at = [this](const char* name) { return glGetUniformLocation(_program, name); };
     _uniforms = {at("toCamera"), at("projection"),     at("normalMatrix"),   at("diffuse"),    at("opacity"),
                  at("premultiply"), at("wireSize"), at("lightDirection"), at("ambientShare")};
