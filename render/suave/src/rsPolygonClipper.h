@@ -14,6 +14,7 @@
 // y minimum 4, y maximum 8, z minimum 16, z maximum 32). The result is a convex polygon, given as
 // a list of vertex indices into the clipper's vertex store; the triangle's own three vertices are
 // indices 0 to 2 and new vertices are appended behind them.
+#include <cmath>
 #include <vector>
 
 #include "geHomogeneousCoord3.h"
@@ -121,14 +122,19 @@ private:
             const int curIndex = _polygon[i];
             const double cur = valueOf(_vertices[static_cast<std::size_t>(curIndex)], bit);
             if (prev * cur < 0.0) {
-                // The edge crosses the plane: the new vertex lies where the value is zero.
+                // The edge crosses the plane: the new vertex lies where the value is zero. An
+                // infinite value (a position beyond the float range) leaves no such place, only
+                // weights that are not numbers: the crossing is then left out, so that no vertex
+                // that is not a number reaches the division.
                 const double a = cur / (cur - prev);
                 const double b = -prev / (cur - prev);
-                Vertex crossing{};
-                rsMixVertex(crossing, _vertices[static_cast<std::size_t>(prevIndex)], a,
-                            _vertices[static_cast<std::size_t>(curIndex)], b);
-                _vertices.push_back(crossing);
-                _scratch.push_back(static_cast<int>(_vertices.size() - 1));
+                if (std::isfinite(a) && std::isfinite(b)) {
+                    Vertex crossing{};
+                    rsMixVertex(crossing, _vertices[static_cast<std::size_t>(prevIndex)], a,
+                                _vertices[static_cast<std::size_t>(curIndex)], b);
+                    _vertices.push_back(crossing);
+                    _scratch.push_back(static_cast<int>(_vertices.size() - 1));
+                }
             }
             if (cur >= 0.0) _scratch.push_back(curIndex);
             prevIndex = curIndex;
