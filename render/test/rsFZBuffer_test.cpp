@@ -1,65 +1,168 @@
-// The fragment Z-buffer as a whole: its arrays and memory account, pool growth under overlap, and
-// triangles drawn through its three rasterizers and resolved by finalize, against a composite of
-// the covered layers computed here.
+// The fragment Z-buffer: per-pixel lists in both modes against a model that states what a list
+// must hold without building it; the pool's growth in its memory account; triangles drawn through
+// its three rasterizers and resolved against the layered composite; and what a factory hands the
+// buffers it makes.
+//
+// Hand-made spans tell the material which fragment it shades through the eye position, which runs
+// (x, id, 0) along the span (x the region-relative pixel, id the span's number); the depth starts
+// at z0 and changes by slope per pixel. Binary fractions keep every depth exact.
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cfloat>
+#include <map>
+#include <random>
 #include <vector>
 
-#include "rsFZBufferTestSupport.h"
-#include "rsImageCreatorTestSupport.h"
+#include "rsDrawContext.h"
+#include "rsFZBuffer.h"
+#include "rsFZBufferFactory.h"
+#include "rsTestSupport.h"
 #include "rsTransferFunc.h"
 
 namespace Zr {
 namespace {
 
-using namespace RsFZBufferTest;
-using RsImageTest::makeTile;
-using RsImageTest::pixelColour;
+using namespace RsTest;
 using Mode = SdMaterial::TransferMode;
 
-// A new buffer: every list empty, and either a Z-buffer at the largest finite double or a closed
-// map of zeros, never both. The memory account is the object, its pool, one chunk of one
-// fragment per pixel, and the arrays that exist.
-TEST(RsFZBuffer, NewBufferArraysAndMemoryAccount) {
-    const std::pair<int, int> sizes[] = {{1, 1}, {7, 3}, {128, 128}, {0, 5}};
-    for (const auto& [w, h] : sizes)
-        for (bool zBuffer : {false, true}) {
-            RsFZBuffer buffer(-40, 17, w, h, zBuffer, true);
-            EXPECT_EQ(buffer.getPixelRegion(), GeRectangle<int>(-40, -40 + w, 17, 17 + h));
-            EXPECT_EQ(buffer.hasZBuffer(), zBuffer);
-            EXPECT_EQ(buffer.getZBuffer() != nullptr, zBuffer);
-            EXPECT_EQ(buffer.getClosed() != nullptr, !zBuffer);
-            const std::size_t n = std::size_t(w) * std::size_t(h);
-            for (std::size_t i = 0; i < n; ++i) {
-                ASSERT_EQ(buffer.getLists()[i], nullptr);
-                if (zBuffer) {
-                    ASSERT_EQ(buffer.getZBuffer()[i], DBL_MAX);
-                } else {
-                    ASSERT_EQ(buffer.getClosed()[i], 0);
+RsDrawContext makeContext(RsMaterialShader& material, RsTransferFunc::Function transfer, bool canBeOpaque) {
+    RsDrawContext context;
+    context._transfer = transfer;
+    context._canBeOpaque = canBeOpaque;
+    context._material = &material;
+    return context;
+}
+
+// Feeds the pixels [x1, x2) of region-relative row `row` to the span method of the buffer's mode.
+void feedSpan(RsFZBuffer& buffer, const RsDrawContext& context, int row, int x1, int x2, int id, double z0, double slope) {
+    RsPixelData<RsPlainVertex> data{};
+    data._w._q = 1.0;
+    data._z._q = z0;
+    data._z._dq_dx = slope;
+    data._eyeCoord._q = GePoint3<float>(static_cast<float>(x1), static_cast<float>(id), 0.0f);
+    data._eyeCoord._dq_dx = GePoint3<float>(1.0f, 0.0f, 0.0f);
+    if (buffer.hasZBuffer()) buffer.drawSpanZ(context, row, {x1, x2}, data);
+    else buffer.drawSpanNoZ(context, row, {x1, x2}, data);
+}
+
+// One fragment that a span offered to a pixel.
+struct Offer {
+    int seq, id, x;  // arrival order at its pixel, span number, pixel
+    double depth;
+    bool opaque;
+    RsTransferFunc::Function transfer;
+};
+
+// What a pixel must hold after its offers, head first, with the offers shaded in order.
+struct Expected {
+    std::vector<Offer> list, shaded;
+    double nearestOpaque = RsFZBuffer::kEmptyDepth;
+    bool closed = false;
+};
+
+// With Z, an offer is taken when it lies strictly before every opaque fragment taken before it; a
+// taken one stays unless a later taken opaque one lies strictly before it; the list runs from far
+// to near, and at equal depth the later arrival lies farther. Without Z, every offer is taken
+// until a taken opaque one closes the pixel, and the last taken lies at the head.
+Expected model(bool zBuffer, const std::vector<Offer>& offers) {
+    Expected e;
+    for (const Offer& o : offers) {
+        if (zBuffer ? !(e.nearestOpaque > o.depth) : e.closed) continue;
+        e.shaded.push_back(o);
+        if (o.opaque) zBuffer ? void(e.nearestOpaque = o.depth) : void(e.closed = true);
+    }
+    if (!zBuffer) {
+        e.list.assign(e.shaded.rbegin(), e.shaded.rend());
+        return e;
+    }
+    for (const Offer& f : e.shaded)
+        if (std::none_of(e.shaded.begin(), e.shaded.end(),
+                         [&](const Offer& g) { return g.seq > f.seq && g.opaque && g.depth < f.depth; }))
+            e.list.push_back(f);
+    std::sort(e.list.begin(), e.list.end(),
+              [](const Offer& a, const Offer& b) { return a.depth != b.depth ? a.depth > b.depth : a.seq > b.seq; });
+    return e;
+}
+
+// Random spans (some empty or inverted) with tied depths, opaque and transparent alphas on both
+// sides of the float tolerance of one, materials that can or cannot be opaque, and three transfer
+// functions. After every span the shade calls, each pixel's list and its depth or closed state
+// match the model. The material answers (id, x, 0.5, alpha) so that an entry names its offer.
+TEST(RsFZBuffer, ListsMatchTheModelInBothModes) {
+    constexpr int width = 6, height = 4;
+    const std::pair<float, bool> alphas[] = {{1.0f, true}, {1.0000001f, true}, {0.99999994f, true}, {0.9999999f, true},
+                                             {1.5f, false}, {1.0000003f, false}, {0.999f, false}, {0.0f, false},
+                                             {0.5f, false}, {1.0f, true}};
+    const double depths[] = {0.25, 0.5, 0.75, 1.0, 1.25}, slopes[] = {0.0, 0.0, 0.25, -0.25};
+    const RsTransferFunc::Function transfers[] = {RsTransferFunc::getFunction(Mode::normal),
+                                                  RsTransferFunc::getFunction(Mode::add),
+                                                  RsTransferFunc::getFunction(Mode::multiply)};
+    for (bool zBuffer : {true, false})
+        for (unsigned seed = 1; seed <= 12; ++seed) {
+            std::mt19937 rng(seed);
+            std::map<std::pair<int, int>, float> alphaOf;  // by (span id, x)
+            std::vector<std::pair<int, int>> shadeCalls, expectedCalls;
+            MaterialSettings settings;
+            settings.probe = [&](const RsShadingContext& c) {
+                const int id = static_cast<int>(c._eyeCoord.y), x = static_cast<int>(c._eyeCoord.x);
+                shadeCalls.emplace_back(id, x);
+                return Rgba(float(id), float(x), 0.5f, alphaOf.at({id, x}));
+            };
+            TestMaterial material(settings);
+            RsFZBuffer buffer(13, -7, width, height, zBuffer, true);
+            std::map<std::pair<int, int>, std::vector<Offer>> offers;  // by pixel (x, row)
+            std::uniform_int_distribution<int> coin(0, 1), rowOf(0, height - 1), xOf(0, width);
+            for (int id = 0; id < 120; ++id) {
+                const int row = rowOf(rng), x1 = xOf(rng), x2 = std::max(x1 - 1, xOf(rng));
+                const double z0 = depths[rng() % std::size(depths)], slope = slopes[rng() % std::size(slopes)];
+                const bool canBeOpaque = coin(rng) == 1;
+                const RsTransferFunc::Function transfer = transfers[rng() % std::size(transfers)];
+                for (int x = x1; x < x2; ++x) {
+                    const auto& [alpha, one] = alphas[rng() % std::size(alphas)];
+                    alphaOf[{id, x}] = alpha;
+                    std::vector<Offer>& pixel = offers[{x, row}];
+                    const std::size_t shadedBefore = model(zBuffer, pixel).shaded.size();
+                    pixel.push_back({int(pixel.size()), id, x, z0 + slope * (x - x1), canBeOpaque && one, transfer});
+                    if (model(zBuffer, pixel).shaded.size() > shadedBefore) expectedCalls.emplace_back(id, x);
                 }
+                feedSpan(buffer, makeContext(material, transfer, canBeOpaque), row, x1, x2, id, z0, slope);
+                ASSERT_EQ(shadeCalls, expectedCalls) << "after span " << id;
+                for (int y = 0; y < height; ++y)
+                    for (int x = 0; x < width; ++x) {
+                        const Expected e = model(zBuffer, offers[{x, y}]);
+                        std::vector<const RsFragment*> got;
+                        for (const RsFragment* f = buffer.getLists()[y * width + x]; f != nullptr; f = f->_next)
+                            got.push_back(f);
+                        ASSERT_EQ(got.size(), e.list.size()) << "pixel " << x << "," << y << " after span " << id;
+                        for (std::size_t i = 0; i < got.size(); ++i) {
+                            EXPECT_EQ(int(got[i]->_color.r), e.list[i].id) << "pixel " << x << "," << y << " entry " << i;
+                            EXPECT_EQ(int(got[i]->_color.g), e.list[i].x);
+                            EXPECT_EQ(got[i]->_depth, e.list[i].depth);
+                            EXPECT_EQ(got[i]->_transfer, e.list[i].transfer);
+                        }
+                        if (zBuffer) ASSERT_EQ(buffer.getZBuffer()[y * width + x], e.nearestOpaque);
+                        else ASSERT_EQ(buffer.getClosed()[y * width + x] != 0, e.closed);
+                    }
             }
-            EXPECT_EQ(buffer.getPool().getChunkCount(), 1u);
-            EXPECT_EQ(buffer.getPool().getFreeFragments(), n);
-            const std::size_t perPixel = sizeof(RsFragment) + sizeof(RsFragment*) + (zBuffer ? sizeof(double) : 1);
-            EXPECT_EQ(buffer.getMemorySize(), sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + n * perPixel)
-                << w << "x" << h;
         }
 }
 
-// More fragments than pixels take a second chunk of one fragment per pixel, and the account grows
-// by it.
-TEST(RsFZBuffer, OverlapGrowsThePoolByWholeChunks) {
-    const auto material = makeShared<ScriptedMaterial>([](const RsShadingContext&) { return Rgba(1, 1, 1, 0.5f); });
-    RsFZBuffer buffer(0, 0, 5, 2, true, true);
-    const std::size_t before = buffer.getMemorySize();
-    const RsDrawContext context = makeContext(*material, RsTransferFunc::getFunction(Mode::normal), true);
-    for (int layer = 0; layer < 3; ++layer)
-        for (int row = 0; row < 2; ++row) feedSpan(buffer, context, row, 0, 5, layer, 0.5 - 0.1 * layer, 0.0);
-    EXPECT_EQ(material->_calls, 30);
-    EXPECT_EQ(buffer.getPool().getChunkCount(), 3u);
-    EXPECT_EQ(buffer.getMemorySize(), before + 2 * 10 * sizeof(RsFragment));
+// The memory account is the object, its pool, one chunk of one fragment per pixel and the
+// per-pixel arrays; more fragments than pixels take whole chunks more.
+TEST(RsFZBuffer, MemoryAccountGrowsByWholeChunks) {
+    for (bool zBuffer : {false, true}) {
+        TestMaterial material(MaterialSettings(Rgba(1, 1, 1, 0.5f)));
+        RsFZBuffer buffer(-40, 17, 5, 2, zBuffer, true);
+        const std::size_t perPixel = sizeof(RsFragment) + sizeof(RsFragment*) + (zBuffer ? sizeof(double) : 1);
+        EXPECT_EQ(buffer.getMemorySize(), sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel);
+        for (int layer = 0; layer < 3; ++layer)
+            for (int row = 0; row < 2; ++row)
+                feedSpan(buffer, makeContext(material, RsTransferFunc::getFunction(Mode::normal), true), row, 0, 5,
+                         layer, 0.5 - 0.1 * layer, 0.0);
+        EXPECT_EQ(material._calls, 30);
+        EXPECT_EQ(buffer.getPool().getChunkCount(), 3u);
+        EXPECT_EQ(buffer.getMemorySize(), sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel + 20 * sizeof(RsFragment));
+    }
 }
 
 template <class Vertex>
@@ -68,15 +171,11 @@ Vertex vertexAt(double x, double y, double z) {
     v._pixCoord = GeHomogeneousCoord3<double>(x, y, z, 1.0);
     v._w = 1.0;
     if constexpr (requires { v._normal; }) v._normal = GePoint3<double>(0.0, 0.0, 1.0);
-    if constexpr (requires { v._tangent; }) {
-        v._tangent = GePoint3<double>(1.0, 0.0, 0.0);
-        v._binormal = GePoint3<double>(0.0, 1.0, 0.0);
-    }
+    if constexpr (requires { v._tangent; }) v._tangent = GePoint3<double>(1.0, 0.0, 0.0), v._binormal = GePoint3<double>(0.0, 1.0, 0.0);
     return v;
 }
 
-// A rectangle of pixels x0 <= x < x1, y0 <= y < y1 at one depth, as two triangles whose edges lie
-// on pixel borders, so that exactly those pixels' centres are inside.
+// A rectangle of pixels at one depth, as two triangles whose edges lie on pixel borders.
 struct Quad {
     GeRectangle<int> pixels;
     double depth;
@@ -85,99 +184,101 @@ struct Quad {
 
 template <class Vertex>
 void drawQuad(const RsFZBuffer& buffer, const RsDrawContext& context, const Quad& q) {
-    const Vertex a = vertexAt<Vertex>(q.pixels.x0, q.pixels.y0, q.depth);
-    const Vertex b = vertexAt<Vertex>(q.pixels.x1, q.pixels.y0, q.depth);
-    const Vertex c = vertexAt<Vertex>(q.pixels.x1, q.pixels.y1, q.depth);
-    const Vertex d = vertexAt<Vertex>(q.pixels.x0, q.pixels.y1, q.depth);
-    buffer.rasterizeTriangle(context, a, b, c);
-    buffer.rasterizeTriangle(context, a, c, d);
-}
-
-// "Over" of straight layers, far to near, onto a straight start colour; returns the straight
-// result (the buffers unpremultiply).
-Rgba over(const Rgba& start, const std::vector<Rgba>& layers) {
-    double r = start.r * start.a, g = start.g * start.a, b = start.b * start.a, a = start.a;
-    for (const Rgba& s : layers) {
-        r = s.r * s.a + r * (1 - s.a);
-        g = s.g * s.a + g * (1 - s.a);
-        b = s.b * s.a + b * (1 - s.a);
-        a = s.a + a * (1 - s.a);
-    }
-    return Rgba(float(r / a), float(g / a), float(b / a), float(a));
+    const auto& rasterizer = buffer.getRasterizer<Vertex>();
+    const Vertex a = vertexAt<Vertex>(q.pixels.x0, q.pixels.y0, q.depth), b = vertexAt<Vertex>(q.pixels.x1, q.pixels.y0, q.depth);
+    const Vertex c = vertexAt<Vertex>(q.pixels.x1, q.pixels.y1, q.depth), d = vertexAt<Vertex>(q.pixels.x0, q.pixels.y1, q.depth);
+    rasterizer.rasterizeTriangle(context, a, b, c);
+    rasterizer.rasterizeTriangle(context, a, c, d);
 }
 
 // Three overlapping quads, one per vertex kind and so per rasterizer, in a region away from the
-// origin, resolved into a tile that is larger still. With Z the drawing order does not matter.
-// Without Z it does: near to far gives the same picture, far to near lets each opaque quad hide
-// whatever is drawn after it.
+// origin, resolved into a larger tile. With Z the drawing order does not matter; without Z far to
+// near lets each opaque quad hide what is drawn after it.
 TEST(RsFZBuffer, TrianglesThroughAllRasterizersResolveToTheLayeredComposite) {
     const GeRectangle<int> region{100, 120, 50, 66};
-    const Quad red{{102, 110, 52, 60}, 0.5, Rgba(1.0f, 0.0f, 0.0f, 1.0f)};
-    const Quad green{{106, 114, 56, 64}, 0.3, Rgba(0.0f, 1.0f, 0.0f, 0.5f)};
-    const Quad blue{{100, 108, 50, 58}, 0.7, Rgba(0.0f, 0.2f, 1.0f, 1.0f)};
+    const Quad quads[] = {{{102, 110, 52, 60}, 0.5, Rgba(1.0f, 0.0f, 0.0f, 1.0f)},
+                          {{106, 114, 56, 64}, 0.3, Rgba(0.0f, 1.0f, 0.0f, 0.5f)},
+                          {{100, 108, 50, 58}, 0.7, Rgba(0.0f, 0.2f, 1.0f, 1.0f)}};
     const Rgba fill(0.1f, 0.2f, 0.3f, 1.0f);
-    const Quad* quads[] = {&red, &green, &blue};
-
-    struct Run {
-        bool zBuffer;
-        std::vector<int> order;  // indices into quads
-    };
-    const Run runs[] = {{true, {1, 0, 2}}, {true, {2, 0, 1}}, {false, {1, 0, 2}}, {false, {2, 0, 1}}};
-    for (const Run& run : runs) {
-        RsFZBuffer buffer(region.x0, region.y0, region.getWidth(), region.getHeight(), run.zBuffer, true);
-        const IxWriteGuard output = makeTile({4, 32}, {95, 125, 45, 70});
-        buffer.setOutput(output, IxReadGuard(), fill, false, 1.0f);
-        for (int i : run.order) {
-            const Quad& q = *quads[i];
-            const Rgba colour = q.colour;
-            const auto material =
-                makeShared<ScriptedMaterial>([colour](const RsShadingContext&) { return colour; });
-            const RsDrawContext context = makeContext(*material, RsTransferFunc::getFunction(Mode::normal), true);
-            if (i == 0) drawQuad<RsPlainVertex>(buffer, context, q);
-            if (i == 1) drawQuad<RsNormalVertex>(buffer, context, q);
-            if (i == 2) drawQuad<RsTangentVertex>(buffer, context, q);
-        }
-        buffer.finalize();
-
-        for (int y = 45; y < 70; ++y)
-            for (int x = 95; x < 125; ++x) {
-                const Rgba got = pixelColour(output, x, y);
-                if (!region.contains(x, y)) {
-                    ASSERT_EQ(got, Rgba(0, 0, 0, 0)) << x << "," << y;
-                    continue;
-                }
-                // Without Z: the covering quads in drawing order up to the first opaque one, the
-                // last drawn farthest. With Z: the covering quads from far to near, from the
-                // nearest opaque one on.
-                std::vector<const Quad*> covering;
-                for (int i : run.order)
-                    if (quads[i]->pixels.contains(x, y)) covering.push_back(quads[i]);
-                std::vector<Rgba> layers;
-                if (!run.zBuffer) {
-                    std::vector<Rgba> taken;
-                    for (const Quad* q : covering) {
-                        taken.push_back(q->colour);
-                        if (q->colour.a == 1.0f) break;
-                    }
-                    layers.assign(taken.rbegin(), taken.rend());
-                } else {
-                    std::sort(covering.begin(), covering.end(),
-                              [](const Quad* a, const Quad* b) { return a->depth > b->depth; });
-                    for (const Quad* q : covering) {
-                        if (q->colour.a == 1.0f) layers.clear();
-                        layers.push_back(q->colour);
-                    }
-                }
-                int listLength = 0;
-                for (const RsFragment* f = buffer.getLists()[(y - 50) * 20 + (x - 100)]; f; f = f->_next) ++listLength;
-                EXPECT_EQ(listLength, int(layers.size())) << x << "," << y;
-                const Rgba want = over(fill, layers);
-                EXPECT_NEAR(got.r, want.r, 1e-6f) << x << "," << y << " Z " << run.zBuffer;
-                EXPECT_NEAR(got.g, want.g, 1e-6f) << x << "," << y;
-                EXPECT_NEAR(got.b, want.b, 1e-6f) << x << "," << y;
-                EXPECT_NEAR(got.a, want.a, 1e-6f) << x << "," << y;
+    for (bool zBuffer : {true, false})
+        for (const std::vector<int>& order : {std::vector<int>{1, 0, 2}, std::vector<int>{2, 0, 1}}) {
+            RsFZBuffer buffer(region.x0, region.y0, region.getWidth(), region.getHeight(), zBuffer, true);
+            const IxWriteGuard output = makeTile({4, 32}, {95, 125, 45, 70});
+            buffer.setOutput(output, IxReadGuard(), fill, false, 1.0f);
+            for (int i : order) {
+                TestMaterial material(MaterialSettings(quads[i].colour));
+                const RsDrawContext context = makeContext(material, RsTransferFunc::getFunction(Mode::normal), true);
+                if (i == 0) drawQuad<RsPlainVertex>(buffer, context, quads[i]);
+                if (i == 1) drawQuad<RsNormalVertex>(buffer, context, quads[i]);
+                if (i == 2) drawQuad<RsTangentVertex>(buffer, context, quads[i]);
             }
-    }
+            buffer.finalize();
+            for (int y = 45; y < 70; ++y)
+                for (int x = 95; x < 125; ++x) {
+                    if (!region.contains(x, y)) {
+                        ASSERT_EQ(pixelColour(output, x, y), Rgba(0, 0, 0, 0)) << x << "," << y;
+                        continue;
+                    }
+                    // Without Z: the covering quads in drawing order up to the first opaque one, the
+                    // last drawn farthest. With Z: from far to near, from the nearest opaque one on.
+                    std::vector<const Quad*> covering;
+                    for (int i : order)
+                        if (quads[i].pixels.contains(x, y)) covering.push_back(&quads[i]);
+                    std::vector<Rgba> layers;
+                    if (!zBuffer) {
+                        for (const Quad* q : covering)
+                            if (layers.insert(layers.begin(), q->colour); q->colour.a == 1.0f) break;
+                    } else {
+                        std::sort(covering.begin(), covering.end(), [](const Quad* a, const Quad* b) { return a->depth > b->depth; });
+                        for (const Quad* q : covering) {
+                            if (q->colour.a == 1.0f) layers.clear();
+                            layers.push_back(q->colour);
+                        }
+                    }
+                    int length = 0;
+                    for (const RsFragment* f = buffer.getLists()[(y - 50) * 20 + (x - 100)]; f; f = f->_next) ++length;
+                    EXPECT_EQ(length, int(layers.size())) << x << "," << y;
+                    expectNearRgba(pixelColour(output, x, y), overComposite(fill, layers), 1e-6, "Z " + std::to_string(zBuffer));
+                }
+        }
+}
+
+// A factory's buffers cover the region asked for in the factory's depth mode, and resolve with
+// what the factory was given: output, background, fill colour, accumulation, weight and
+// unpremultiplication. An empty buffer resolves to its start colours (background where it covers,
+// fill elsewhere) premultiplied, weighted, perhaps unpremultiplied, replaced or added. A buffer
+// keeps the output it was made with.
+TEST(RsFZBufferFactory, BuffersTakeTheFactorysRegionModeAndSettings) {
+    const Rgba fill(0.2f, 0.4f, 0.6f, 0.5f), bgColour(1.0f, 0.5f, 0.25f, 0.5f), initial(0.125f, 0.125f, 0.125f, 0.125f);
+    const IxWriteGuard bgTile = makeTile({4, 32}, {10, 14, 0, 100}, bgColour);
+    for (bool accumulate : {false, true})
+        for (float weight : {1.0f, 0.5f})
+            for (bool unpremultiply : {false, true}) {
+                const IxWriteGuard output = makeTile({4, 32}, {0, 20, 0, 6}, initial);
+                RsFZBufferFactory factory;
+                factory.setZBuffer(accumulate);
+                factory.setOutput(output, accumulate, weight);
+                factory.setFillColor(fill);
+                factory.setBackground(IxReadGuard(bgTile));
+                factory.setUnpremultiply(unpremultiply);
+                EXPECT_EQ(factory.getPixelRegion(), GeRectangle<int>(0, 20, 0, 6));
+                const RCShdPtr<RsFZBuffer> buffer = factory.createBuffer({8, 16, 2, 5});
+                EXPECT_EQ(buffer->getPixelRegion(), GeRectangle<int>(8, 16, 2, 5));
+                EXPECT_EQ(buffer->hasZBuffer(), accumulate);
+                factory.setOutput(makeTile({4, 32}, {0, 20, 0, 6}), false, 1.0f);
+                buffer->finalize();
+                for (int y = 0; y < 6; ++y)
+                    for (int x = 0; x < 20; ++x) {
+                        Rgba want = initial;
+                        if (x >= 8 && x < 16 && y >= 2 && y < 5) {
+                            const Rgba s = x >= 10 && x < 14 ? bgColour : fill;
+                            Rgba pixel(s.r * s.a * weight, s.g * s.a * weight, s.b * s.a * weight, s.a * weight);
+                            if (unpremultiply) pixel = Rgba(s.r, s.g, s.b, pixel.a);
+                            want = accumulate ? initial + pixel : pixel;
+                        }
+                        expectNearRgba(pixelColour(output, x, y), want, 1e-6, std::to_string(x) + "," + std::to_string(y));
+                    }
+            }
 }
 
 }  // namespace

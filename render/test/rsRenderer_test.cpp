@@ -1,48 +1,51 @@
-// The renderer's entry points, seen through the pixels of a float output tile: layers of random
-// colour and opacity composited in depth order with and without the Z-buffer against a composite
-// computed here from the layer list, watertight coverage in the add mode, the camera overload,
-// and the entry's failures.
+// The renderer's entry points, seen through the pixels of a float output tile: layers composited in
+// depth order with and without the Z-buffer against the reference composite, watertight coverage
+// in the add mode, lights prepared on every call, the camera overload and the entry's failures,
+// a cancel from another thread, and hostile scenes.
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <condition_variable>
+#include <limits>
+#include <mutex>
 #include <random>
 #include <string>
+#include <thread>
 
 #include "exBase.h"
-#include "rsRenderTestSupport.h"
-#include "rsRenderer.h"
+#include "rsTestSupport.h"
 #include "sdCamera.h"
 #include "sdMeshGeometry.h"
 
 namespace Zr {
 namespace {
 
-using namespace RenderTest;
+using namespace RsTest;
+
 // Camera space to -1..1 for a parallel view whose pixels are units: x from -w/2 to w/2.
 GeProjectiveMatrix3<double> parallel(int w, int h, double n, double f) {
-    return GeProjectiveMatrix3<double>(2.0 / w, 0, 0, 0,  //
-                                       0, 2.0 / h, 0, 0,  //
-                                       0, 0, -2.0 / (f - n), -(f + n) / (f - n),  //
-                                       0, 0, 0, 1);
+    return {2.0 / w, 0, 0, 0, 0, 2.0 / h, 0, 0, 0, 0, -2.0 / (f - n), -(f + n) / (f - n), 0, 0, 0, 1};
 }
 
-// An axis-aligned quad facing the camera at depth z, over pixels [x0, x1) x [y0, y1) of a
-// parallel view of width w and height h.
+// An axis-aligned quad facing the camera at depth z over pixels [x0, x1) x [y0, y1) of a parallel
+// view of width w and height h; wound the other way when x0 > x1.
 RCShdPtr<const SdMesh> quad(int w, int h, int x0, int x1, int y0, int y1, float z) {
-    auto cx = [&](int px) { return static_cast<float>(px - w / 2); };
-    auto cy = [&](int py) { return static_cast<float>(py - h / 2); };
-    return makeMesh({{cx(x0), cy(y0), z}, {cx(x1), cy(y0), z}, {cx(x1), cy(y1), z}, {cx(x0), cy(y1), z}},
-                    {0, 1, 2, 0, 2, 3});
+    const float l = float(x0 - w / 2), r = float(x1 - w / 2), b = float(y0 - h / 2), t = float(y1 - h / 2);
+    return makeMesh({{l, b, z}, {r, b, z}, {r, t, z}, {l, t, z}}, {0, 1, 2, 0, 2, 3});
 }
 
+// Random quads of random colour and opacity at distinct depths, wound either way and drawn on
+// chosen sides: with and without the Z-buffer each pixel is the fill colour with the layers drawn
+// there laid over it from far to near.
 TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
     std::mt19937 rng(3);
     const int w = 40, h = 30;
     const GeRectangle<int> rect{0, w, 0, h};
     std::uniform_real_distribution<float> unit(0.0f, 1.0f);
+    const Rgba fill(0.2f, 0.4f, 0.6f, 0.5f);
     for (int trial = 0; trial < 20; ++trial) {
         struct Layer {
-            int x0, x1, y0, y1;
+            GeRectangle<int> pixels;
             float z;
             Rgba colour;
         };
@@ -54,67 +57,43 @@ TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
         for (float z : depths) {
             const int x0 = int(rng() % w), x1 = x0 + 1 + int(rng() % (w - x0));
             const int y0 = int(rng() % h), y1 = y0 + 1 + int(rng() % (h - y0));
-            // Half of the layers opaque, the others transparent.
             const float alpha = rng() % 2 ? 1.0f : 0.1f + 0.8f * unit(rng);
-            const Layer layer{x0, x1, y0, y1, z, Rgba(unit(rng), unit(rng), unit(rng), alpha)};
-            layers.push_back(layer);
-            ProbeMaterial::Settings settings;
-            settings.colour = layer.colour;
-            // Wound towards the camera or away from it, and drawn on one side or both.
+            const Layer layer{{x0, x1, y0, y1}, z, Rgba(unit(rng), unit(rng), unit(rng), alpha)};
             const bool front = rng() % 2;
-            instances.push_back(makeInstance(quad(w, h, front ? x0 : x1, front ? x1 : x0, y0, y1, z), settings));
+            instances.push_back(drawn(quad(w, h, front ? x0 : x1, front ? x1 : x0, y0, y1, z), MaterialSettings(layer.colour)));
             instances.back()->_drawFrontFaces = rng() % 3 != 0;
             instances.back()->_drawBackFaces = rng() % 3 != 0;
-            if (!(front ? instances.back()->_drawFrontFaces : instances.back()->_drawBackFaces)) layers.pop_back();
+            if (front ? instances.back()->_drawFrontFaces : instances.back()->_drawBackFaces) layers.push_back(layer);
         }
         const RCShdPtr<RsScene> scene = makeScene(instances);
-        const GeProjectiveMatrix3<double> projection = parallel(w, h, 0.5, 20.0);
-        const Rgba fill(0.2f, 0.4f, 0.6f, 0.5f);
-
         Picture withZ(rect), withoutZ(rect);
         RsRenderer renderer;
         renderer.setFillColor(fill);
-        renderer.render({}, projection, scene, rect, withZ.guard);
+        renderer.render({}, parallel(w, h, 0.5, 20.0), scene, rect, withZ.guard);
         renderer.setZBuffer(false);
-        renderer.render({}, projection, scene, rect, withoutZ.guard);
-
+        renderer.render({}, parallel(w, h, 0.5, 20.0), scene, rect, withoutZ.guard);
+        std::sort(layers.begin(), layers.end(), [](const Layer& a, const Layer& b) { return a.z < b.z; });
         for (int y = 0; y < h; ++y)
             for (int x = 0; x < w; ++x) {
-                // Far to near, each layer laid over the fill colour and what came before.
-                std::vector<Layer> here;
+                std::vector<Rgba> here;
                 for (const Layer& l : layers)
-                    if (x >= l.x0 && x < l.x1 && y >= l.y0 && y < l.y1) here.push_back(l);
-                std::sort(here.begin(), here.end(), [](const Layer& a, const Layer& b) { return a.z < b.z; });
-                double r = fill.r * fill.a, g = fill.g * fill.a, b = fill.b * fill.a, a = fill.a;
-                for (const Layer& l : here) {
-                    const double sa = l.colour.a;
-                    r = l.colour.r * sa + r * (1 - sa);
-                    g = l.colour.g * sa + g * (1 - sa);
-                    b = l.colour.b * sa + b * (1 - sa);
-                    a = sa + a * (1 - sa);
-                }
-                for (const Picture* picture : {&withZ, &withoutZ}) {
-                    const Rgba p = picture->at(x, y);
-                    EXPECT_NEAR(p.r, r / a, 1e-5) << x << ", " << y;
-                    EXPECT_NEAR(p.g, g / a, 1e-5);
-                    EXPECT_NEAR(p.b, b / a, 1e-5);
-                    EXPECT_NEAR(p.a, a, 1e-5);
-                }
+                    if (l.pixels.contains(x, y)) here.push_back(l.colour);
+                const Rgba want = overComposite(fill, here);
+                expectNearRgba(withZ.at(x, y), want, 1e-5, "with Z at " + std::to_string(x) + "," + std::to_string(y));
+                expectNearRgba(withoutZ.at(x, y), want, 1e-5, "without Z at " + std::to_string(x) + "," + std::to_string(y));
             }
     }
 }
 
-// The eye inside a closed box whose faces are drawn from both sides, in the add mode with colour
-// 1: every ray leaves the box through exactly one surface, so every pixel sums to exactly 1 -
-// across the box's seams, across the many regions of a big picture and where the faces run past
-// the sides - except where the exit point lies nearer than the near limit or beyond the far plane
-// and is clipped away.
+// The eye inside a closed box whose faces are seen from behind, in the add mode with colour 1:
+// every ray leaves the box through exactly one surface, so every pixel sums to exactly 1 - across
+// the box's seams, across the many regions of a big picture and where faces run past the sides -
+// except where the exit point lies nearer than the near limit or beyond the far plane.
 TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
     std::mt19937 rng(8);
     std::uniform_real_distribution<double> unit(-1.0, 1.0);
     const GeRectangle<int> rect{-150, 170, -90, 150};  // 76800 pixels: many regions
     // Four corners and the outward normal per face, so that the faces are flat and wound outwards.
-    SdMeshBuilder builder;
     std::vector<GePoint3<float>> corners;
     std::vector<GeVector3<float>> normals;
     std::vector<std::uint32_t> triangles;
@@ -129,10 +108,10 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
                 corners.emplace_back(c[0], c[1], c[2]);
                 normals.emplace_back(axis == 0 ? sign : 0.0f, axis == 1 ? sign : 0.0f, axis == 2 ? sign : 0.0f);
             }
-            const std::vector<std::uint32_t> face = sign > 0 ? std::vector<std::uint32_t>{v, v + 1, v + 3, v, v + 3, v + 2}
-                                                             : std::vector<std::uint32_t>{v, v + 3, v + 1, v, v + 2, v + 3};
-            triangles.insert(triangles.end(), face.begin(), face.end());
+            triangles.insert(triangles.end(), {v, sign > 0 ? v + 1 : v + 3, sign > 0 ? v + 3 : v + 1,
+                                               v, sign > 0 ? v + 3 : v + 2, sign > 0 ? v + 2 : v + 3});
         }
+    SdMeshBuilder builder;
     builder.setVertices(corners).setTriangles(triangles).setNormals(normals);
     const RCShdPtr<const SdMesh> box = builder.build();
     int clipped = 0;
@@ -141,14 +120,13 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
         const GeProjectiveMatrix3<double> projection = perspective(1.2, 0.5, trial < 2 ? 50.0 : 2.5);
         // Seen from inside every face is a back face, drawn with its normal turned to the eye: a
         // fragment counts only when it is.
-        ProbeMaterial::Settings settings = counting(trial % 2 ? 0x03u : 0x41u);
+        MaterialSettings settings = counting(trial % 2 ? 0x03u : 0x41u);
         settings.probe = [](const RsShadingContext& c) {
-            const bool facing = c._normal.dot(GeVector3<float>(c._eyeCoord.x, c._eyeCoord.y, c._eyeCoord.z)) < 0.0f;
-            return facing ? Rgba(1, 1, 1, 1) : Rgba(0, 0, 0, 1);
+            return c._normal.dot(GeVector3<float>(c._eyeCoord.x, c._eyeCoord.y, c._eyeCoord.z)) < 0.0f ? Rgba(1, 1, 1, 1) : Rgba(0, 0, 0, 1);
         };
         // Local to camera: scale by 2, turn about z (roll) and y (yaw), then move so that the eye
-        // sits at local point e: near the back wall, with the box ahead, and so close to the
-        // side wall x = -1 that rays turned towards it meet it within the near limit.
+        // sits at local point e: near the back wall, with the box ahead, and so close to the side
+        // wall x = -1 that rays turned towards it meet it within the near limit.
         const double roll = 3.0 * unit(rng), yaw = 0.3 * unit(rng);
         const double e[3] = {-0.93 + 0.02 * trial, 0.8 * unit(rng), 0.85};
         double m[3][3] = {{std::cos(roll) * std::cos(yaw), -std::sin(roll), std::cos(roll) * std::sin(yaw)},
@@ -159,28 +137,24 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
             for (int c = 0; c < 3; ++c) m[r][c] *= 2.0;
             t[r] = -(m[r][0] * e[0] + m[r][1] * e[1] + m[r][2] * e[2]);
         }
-        const GeAffineMatrix3<float> toCamera{float(m[0][0]), float(m[0][1]), float(m[0][2]), float(t[0]),  //
-                                              float(m[1][0]), float(m[1][1]), float(m[1][2]), float(t[1]),  //
+        const GeAffineMatrix3<float> toCamera{float(m[0][0]), float(m[0][1]), float(m[0][2]), float(t[0]),
+                                              float(m[1][0]), float(m[1][1]), float(m[1][2]), float(t[1]),
                                               float(m[2][0]), float(m[2][1]), float(m[2][2]), float(t[2])};
-        const RCShdPtr<RsGeomInstance> instance = makeInstance(box, settings, toCamera);
+        const RCShdPtr<RsGeomInstance> instance = drawn(box, settings, toCamera);
         instance->_drawFrontFaces = false;
-        const RCShdPtr<RsScene> scene = makeScene({instance});
         Picture picture(rect);
-        render(scene, projection, rect, picture);
-
+        render(makeScene({instance}), projection, rect, picture);
         for (int y = rect.y0; y < rect.y1; ++y)
             for (int x = rect.x0; x < rect.x1; ++x) {
                 // The ray through the pixel centre, in the box's frame (m is a scaled rotation, so
                 // its inverse is its transpose over 4), leaves the box at tExit.
-                const double d[3] = {(x + 0.5 - 10.0) / 160.0 / projection(0, 0),
-                                     (y + 0.5 - 30.0) / 120.0 / projection(1, 1), -1.0};
+                const double d[3] = {(x + 0.5 - 10.0) / 160.0 / projection(0, 0), (y + 0.5 - 30.0) / 120.0 / projection(1, 1), -1.0};
                 double tExit = 1e300;
                 for (int axis = 0; axis < 3; ++axis) {
                     const double dl = (m[0][axis] * d[0] + m[1][axis] * d[1] + m[2][axis] * d[2]) / 4.0;
                     if (dl != 0.0) tExit = std::min(tExit, ((dl > 0 ? 1.0 : -1.0) - e[axis]) / dl);
                 }
-                const double zc = projection(2, 2) * -tExit + projection(2, 3);
-                const double pixelZ = 0.5 * zc / tExit + 0.5;
+                const double pixelZ = 0.5 * (projection(2, 2) * -tExit + projection(2, 3)) / tExit + 0.5;
                 if (std::abs(pixelZ + 1.0) < 1e-6 || std::abs(pixelZ - 1.0) < 1e-6) continue;
                 const float expected = pixelZ > -1.0 && pixelZ < 1.0 ? 1.0f : 0.0f;
                 clipped += expected == 0.0f;
@@ -190,84 +164,171 @@ TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
     EXPECT_GT(clipped, 1000);
 }
 
-// Lights are prepared on every call, in the scene's order and before any pixel is drawn, even in a
-// scene without instances, whose picture is then the fill colour.
+// Lights are prepared on every call, in the scene's order and with the call's view, before any
+// pixel is drawn, even in a scene without instances, whose picture is then the fill colour.
 TEST(RsRenderer, LightsArePreparedOnEveryCallEvenWithoutInstances) {
     struct OrderedLight : RsLightShader {
         OrderedLight(std::vector<std::string>& log, std::string name) : _log(log), _name(std::move(name)) {}
         void setupRender(const GeAffineMatrix3<float>& worldToCamera) override {
-            _log.push_back(_name + " setup");
-            _lastView = worldToCamera;
+            _log.push_back(_name + " setup " + std::to_string(worldToCamera(0, 3)));
         }
         void initializeMaps(const RCShdPtr<RsScene>&) override { _log.push_back(_name + " maps"); }
         std::vector<std::string>& _log;
         std::string _name;
-        GeAffineMatrix3<float> _lastView;
     };
     std::vector<std::string> log;
-    RsScene::GeomInstanceList instances;
-    RsScene::LightList lights{makeShared<OrderedLight>(log, "a"), makeShared<OrderedLight>(log, "b")};
-    RsScene::CameraList cameras;
-    const RCShdPtr<RsScene> scene = makeShared<RsScene>(instances, lights, cameras);
-
+    const RCShdPtr<RsScene> scene = makeScene({}, {makeShared<OrderedLight>(log, "a"), makeShared<OrderedLight>(log, "b")});
     const GeRectangle<int> rect{3, 9, -2, 5};
     const Rgba fill(0.25f, 0.5f, 0.75f, 1.0f);
     RsRenderer renderer;
     renderer.setFillColor(fill);
-    const GeAffineMatrix3<float> view(1, 0, 0, 2, 0, 1, 0, 0, 0, 0, 1, -1);
     Picture picture(rect, Rgba(0, 0, 0, 0));
     for (int call = 0; call < 2; ++call)
-        renderer.render(view, perspective(1.0, 0.1, 10.0), scene, rect, picture.guard);
-
-    EXPECT_EQ(log, (std::vector<std::string>{"a setup", "a maps", "b setup", "b maps",
-                                              "a setup", "a maps", "b setup", "b maps"}));
-    EXPECT_FLOAT_EQ(static_cast<OrderedLight&>(*scene->_lights[1])._lastView(0, 3), 2.0f);
+        renderer.render(GeAffineMatrix3<float>(1, 0, 0, 2, 0, 1, 0, 0, 0, 0, 1, -1), perspective(1.0, 0.1, 10.0), scene, rect, picture.guard);
+    const std::vector<std::string> once = {"a setup 2.000000", "a maps", "b setup 2.000000", "b maps"};
+    std::vector<std::string> twice = once;
+    twice.insert(twice.end(), once.begin(), once.end());
+    EXPECT_EQ(log, twice);
     EXPECT_TRUE(picture == Picture(rect, fill));
 }
 
+// A camera placed by its instance gives the picture of its inverse matrix and projection; an
+// instance of anything else draws nothing, and a missing one is a null pointer. The antialiased
+// path is missing: it fails before touching a pixel.
 TEST(RsRenderer, CameraInstancesAndFailures) {
     const GeRectangle<int> rect{0, 24, 0, 16};
-    const RCShdPtr<RsScene> scene =
-        makeScene({makeInstance(makeMesh({{-1, -1, -3}, {1, -1, -3}, {0, 1, -3}}, {0, 1, 2}), ProbeMaterial::Settings{})});
+    const RCShdPtr<RsScene> scene = makeScene({drawn(makeMesh({{-1, -1, -3}, {1, -1, -3}, {0, 1, -3}}, {0, 1, 2}), {})});
     const Rgba untouched(0.25f, 0.5f, 0.75f, 1.0f);
     RsRenderer renderer;
-
-    // A camera placed by its instance: the same picture as its inverse matrix and projection.
     RCShdPtr<SdCamera> sdCamera = makeShared<SdCamera>();
     sdCamera->_aspect = 1.5f;
     const GeAffineMatrix3<float> place(1, 0, 0, 0.3f, 0, 1, 0, -0.2f, 0, 0, 1, 0.5f);
     const RCShdPtr<SdInstance> camera = makeShared<SdInstance>(sdCamera, place);
-    Picture viaCamera(rect, untouched), viaMatrices(rect, untouched);
+    Picture viaCamera(rect, untouched), viaMatrices(rect, untouched), notDrawn(rect, untouched);
     renderer.render(camera, scene, rect, viaCamera.guard);
     GeProjectiveMatrix3<double> projection;
     sdCamera->computeProjection(projection);
     renderer.render(place.computeInverse(), projection, scene, rect, viaMatrices.guard);
     EXPECT_TRUE(viaCamera == viaMatrices);
-    EXPECT_FALSE(viaCamera == Picture(rect, untouched));
-
-    // An instance of anything but a camera draws nothing.
-    Picture notDrawn(rect, untouched);
-    const RCShdPtr<SdInstance> mesh = makeShared<SdInstance>(makeShared<SdMeshGeometry>(), place);
-    renderer.render(mesh, scene, rect, notDrawn.guard);
-    EXPECT_TRUE(notDrawn == Picture(rect, untouched));
+    EXPECT_FALSE(viaCamera == notDrawn);
+    renderer.render(makeShared<SdInstance>(makeShared<SdMeshGeometry>(), place), scene, rect, notDrawn.guard);
     EXPECT_THROW(renderer.render(RCShdPtr<SdInstance>(), scene, rect, notDrawn.guard), ExNullPtr);
-
-    // The antialiased path is not there: it fails before touching a pixel.
     renderer.setAntialiasing(true);
     EXPECT_THROW(renderer.render(camera, scene, rect, notDrawn.guard), ExProgramAborted);
     EXPECT_TRUE(notDrawn == Picture(rect, untouched));
+}
 
-    const auto abortLine = [](auto call) {
-        try {
-            call();
-        } catch (const ExProgramAborted& e) {
-            EXPECT_EQ(e.getFile(), "render\\suave\\src\\rsRenderer");
-            return e.getLine();
+// A cancel requested from another thread while a render runs ends the render with the cancel
+// exception. The render's first interrupt check tells the other thread that the render has
+// started and waits until that thread has made its request; the next check must see it.
+TEST(RsRenderer, CancelFromAnotherThreadEndsTheRender) {
+    struct Rendezvous : PxInterruptHandler {
+        void onInterruptCheck() override {
+            std::unique_lock<std::mutex> lock(mutex);
+            if (started) return;
+            started = true;
+            changed.notify_all();
+            changed.wait(lock, [this] { return requested; });
         }
-        return -1;
+        std::mutex mutex;
+        std::condition_variable changed;
+        bool started = false, requested = false, finished = false;
     };
-    EXPECT_EQ(abortLine([&] { (void)renderer.getMemUsageMb(); }), 397);
-    EXPECT_EQ(abortLine([&] { (void)renderer.getTileMemUsageMb(); }), 409);
+    const RCShdPtr<Rendezvous> rendezvous = makeShared<Rendezvous>();
+    const InterruptHandlerScope scope(rendezvous);
+    PxRequestMgr* const requests = PxRequestMgr::getInstance();
+    std::thread canceller([&] {
+        std::unique_lock<std::mutex> lock(rendezvous->mutex);
+        rendezvous->changed.wait(lock, [&] { return rendezvous->started || rendezvous->finished; });
+        if (!rendezvous->started) return;
+        requests->requestCancel();
+        rendezvous->requested = true;
+        rendezvous->changed.notify_all();
+    });
+    const GeRectangle<int> rect{0, 48, 0, 48};
+    const RCShdPtr<RsScene> scene = makeScene({drawn(quad(48, 48, 0, 48, 0, 48, -2.0f), {})});
+    std::string outcome = "finished";
+    try {
+        Picture picture(rect);
+        RsRenderer().render({}, parallel(48, 48, 0.5, 20.0), scene, rect, picture.guard);
+    } catch (const ExRenderCancelled&) {
+        outcome = "cancelled";
+    } catch (...) {
+        outcome = "failed otherwise";
+    }
+    {
+        const std::lock_guard<std::mutex> lock(rendezvous->mutex);
+        rendezvous->finished = true;
+        rendezvous->changed.notify_all();
+    }
+    canceller.join();
+    requests->clearCancel();
+    EXPECT_TRUE(rendezvous->started) << "the render ended before its first interrupt check returned";
+    EXPECT_EQ(outcome, "cancelled");
+}
+
+// Random scenes from a fixed seed with coordinates and matrix entries that are not numbers,
+// infinite or huge, faces without area, meshes without vertices or faces, wires of any size, any
+// transfer mode and shading needs, drawn into empty, one-pixel and partial tiles of rectangles
+// that may be empty. Each render gives a picture or fails with the library's own exception; a
+// crash, a hang, another exception or a sanitizer report fails the test.
+TEST(RsRenderer, HostileScenesGiveAPictureOrTheLibrarysException) {
+    std::mt19937 rng(2718);
+    const float specials[] = {std::numeric_limits<float>::quiet_NaN(), std::numeric_limits<float>::infinity(),
+                              -std::numeric_limits<float>::infinity(), 1e30f, -1e30f, 3e38f, 1e-30f, 0.0f, 1e7f};
+    auto pick = [&](int percent) { return int(rng() % 100) < percent; };
+    auto value = [&](int percent, float lo, float hi) {
+        return pick(percent) ? specials[rng() % std::size(specials)] : std::uniform_real_distribution<float>(lo, hi)(rng);
+    };
+    const unsigned int needs[] = {0x00u, 0x01u, 0x03u, 0x3cu, 0x3eu, 0x7fu};
+    int pictures = 0, failures = 0;
+    for (int trial = 0; trial < 400; ++trial) {
+        std::vector<RCShdPtr<RsGeomInstance>> instances;
+        for (int i = int(rng() % 4); i > 0; --i) {
+            std::vector<GePoint3<float>> vertices(pick(15) ? 0 : 3 + rng() % 6);
+            for (GePoint3<float>& v : vertices) {
+                v = GePoint3<float>(value(8, -3, 3), value(8, -3, 3), value(8, -6, 1));
+                if (pick(20)) v = vertices.front();  // repeated corners: faces without area
+            }
+            std::vector<std::uint32_t> triangles;
+            for (int k = vertices.empty() ? 0 : 3 * int(1 + rng() % 6); k > 0; --k)
+                triangles.push_back(std::uint32_t(rng() % vertices.size()));
+            MaterialSettings settings = counting(needs[rng() % std::size(needs)]);
+            settings.mode = SdMaterial::TransferMode(rng() % SdMaterial::transferModeCount);
+            settings.colour = Rgba(value(5, 0, 1), value(5, 0, 1), value(5, 0, 1), value(5, 0, 1.2f));
+            settings.wireframe = pick(30);
+            settings.screenSpace = pick(50);
+            settings.wireSize = value(20, 0, 3);
+            GeAffineMatrix3<float> matrix;
+            if (pick(30)) matrix = GeAffineMatrix3<float>(value(30, -2, 2), value(20, -1, 1), 0, value(20, -1, 1),
+                                                          0, value(30, -2, 2), 0, value(20, -1, 1), 0, 0, value(30, -2, 2), value(20, -3, 1));
+            try {
+                instances.push_back(drawn(makeMesh(vertices, triangles, pick(50) ? vertices : std::vector<GePoint3<float>>{}), settings, matrix));
+                instances.back()->_renderOrder = int(rng() % 3) - 1;
+            } catch (const ExBase&) {
+                ++failures;  // a mesh the builder refuses
+            }
+        }
+        const int x0 = int(rng() % 20) - 10, y0 = int(rng() % 20) - 10;
+        const int kind = int(rng() % 4);
+        const GeRectangle<int> rect{x0, x0 + (kind == 0 ? 0 : kind == 1 ? 1 : int(rng() % 24)), y0, y0 + (kind == 1 ? 1 : int(rng() % 24))};
+        // The output tile: the rectangle, one pixel of it, an empty tile, or one that overhangs it.
+        const int tx = x0 + int(rng() % 4), ty = y0 + int(rng() % 4);
+        const GeRectangle<int> tiles[] = {rect, {tx, tx + 1, ty, ty + 1}, {tx, tx, ty, ty + 3}, {tx - 8, tx + 8, ty - 8, ty + 8}};
+        const GeProjectiveMatrix3<double> projection =
+            pick(50) ? perspective(value(10, 0.2f, 2.5f), value(10, 0.05f, 1), value(10, 2, 100)) : parallel(16, 16, value(10, 0.1f, 1), value(10, 2, 50));
+        const GeRectangle<int> tile = tiles[rng() % 4];
+        try {
+            Picture picture(tile);
+            RsRenderer renderer;
+            renderer.setZBuffer(pick(50));
+            renderer.render(GeAffineMatrix3<float>(), projection, makeScene(instances), rect, picture.guard);
+            ++pictures;
+        } catch (const ExBase&) {
+            ++failures;
+        }
+    }
+    EXPECT_GT(pictures, 200) << failures << " failures";
 }
 
 }  // namespace

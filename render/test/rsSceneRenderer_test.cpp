@@ -11,13 +11,13 @@
 
 #include "rsDrawContext.h"
 #include "rsRasterizer.h"
-#include "rsRenderTestSupport.h"
 #include "rsSceneRenderer.h"
+#include "rsTestSupport.h"
 
 namespace Zr {
 namespace {
 
-using namespace RenderTest;
+using namespace RsTest;
 using Rect = GeRectangle<int>;
 
 struct V3 {
@@ -95,7 +95,7 @@ std::vector<Rect> divide(const Rect& region, int maxArea, int* maxAlive = nullpt
     return factory.regions;
 }
 
-TEST(RsRenderRegions, DivisionTilesTheRegionWithOneBufferAtATime) {
+TEST(RsSceneRenderer, DivisionTilesTheRegionWithOneBufferAtATime) {
     // The limit itself is one region; one pixel more splits at the middle, truncated towards 0.
     EXPECT_EQ(divide({0, 128, 0, 128}, 16384), std::vector<Rect>({{0, 128, 0, 128}}));
     EXPECT_EQ(divide({0, 129, 0, 128}, 16384),
@@ -126,17 +126,17 @@ TEST(RsRenderRegions, DivisionTilesTheRegionWithOneBufferAtATime) {
 // Random triangles, some through the near limit, some beside or behind the eye: a pixel has one
 // fragment exactly when its ray meets the visible part, and its texture coordinates are the
 // barycentric coordinates of the hit, the stand-in for a mesh without texture coordinates.
-TEST(RsRenderRegions, ClippedTrianglesDrawExactlyTheirVisiblePart) {
+TEST(RsSceneRenderer, ClippedTrianglesDrawExactlyTheirVisiblePart) {
     std::mt19937 rng(23);
     std::uniform_real_distribution<float> xy(-4.0f, 4.0f), depth(-6.0f, 1.5f);
     int fragments = 0;
     for (int trial = 0; trial < 40; ++trial) {
         std::vector<GePoint3<float>> corners;
         for (int k = 0; k < 3; ++k) corners.emplace_back(xy(rng), xy(rng), depth(rng));
-        ProbeMaterial::Settings settings = counting(0x3cu);
+        MaterialSettings settings = counting(0x3cu);
         settings.probe = [](const RsShadingContext& c) { return Rgba(float(c._texCoord.x), float(c._texCoord.y), 1, 1); };
         Picture picture(kRect);
-        render(makeScene({makeInstance(makeMesh(corners, {0, 1, 2}), settings)}), kProjection, kRect, picture);
+        render(makeScene({drawn(makeMesh(corners, {0, 1, 2}), settings)}), kProjection, kRect, picture);
         for (int py = kRect.y0; py < kRect.y1; ++py)
             for (int px = kRect.x0; px < kRect.x1; ++px) {
                 const Hit hit = castRay(px, py, toV3(corners[0]), toV3(corners[1]), toV3(corners[2]));
@@ -154,7 +154,7 @@ TEST(RsRenderRegions, ClippedTrianglesDrawExactlyTheirVisiblePart) {
 
 // A textured parallelogram at a grazing angle: at every pixel centre the texture coordinates and
 // their screen derivatives are those of the exact projective map.
-TEST(RsRenderRegions, TextureCoordinatesArePerspectiveCorrect) {
+TEST(RsSceneRenderer, TextureCoordinatesArePerspectiveCorrect) {
     // From z = -1.2 to z = -62.8, turned about y as well, so that 1/w changes along both axes.
     const std::vector<GePoint3<float>> corners = {{-2, -0.8f, -1.2f}, {2, -0.8f, -2.8f}, {2, 0.2f, -62.8f}, {-2, 0.2f, -61.2f}};
     const RCShdPtr<const SdMesh> mesh = makeMesh(corners, {0, 1, 2, 0, 2, 3}, {{0, 0, 0}, {3, 0, 0}, {3, 7, 0}, {0, 7, 0}});
@@ -177,10 +177,10 @@ TEST(RsRenderRegions, TextureCoordinatesArePerspectiveCorrect) {
         }};
     Picture pictures[2] = {Picture(kRect), Picture(kRect)};
     for (int i = 0; i < 2; ++i) {
-        ProbeMaterial::Settings settings;
+        MaterialSettings settings;
         settings.needed = 0x3cu;
         settings.probe = probes[i];
-        render(makeScene({makeInstance(mesh, settings)}), kProjection, kRect, pictures[i]);
+        render(makeScene({drawn(mesh, settings)}), kProjection, kRect, pictures[i]);
     }
     int checked = 0;
     const double h = 1e-3;
@@ -205,7 +205,7 @@ TEST(RsRenderRegions, TextureCoordinatesArePerspectiveCorrect) {
 // Wire rings: a pixel gets one fragment exactly when its centre lies in the triangle within the
 // wire width of an edge - on the screen, three quarters of the wire size in pixels, or in eye
 // space at the point seen - and a triangle narrower than its wire is drawn whole.
-TEST(RsRenderRegions, WireRingsCoverABandAlongTheEdges) {
+TEST(RsSceneRenderer, WireRingsCoverABandAlongTheEdges) {
     std::mt19937 rng(31);
     std::uniform_real_distribution<float> xy(-2.5f, 2.5f), depth(-6.0f, -3.0f), size(0.5f, 4.0f);
     auto lineDistance = [](const V3& p, const V3& a, const V3& b) {
@@ -217,7 +217,7 @@ TEST(RsRenderRegions, WireRingsCoverABandAlongTheEdges) {
         const bool screenSpace = trials % 2 == 0;
         std::vector<GePoint3<float>> corners;
         for (int k = 0; k < 3; ++k) corners.emplace_back(xy(rng), xy(rng), depth(rng));
-        ProbeMaterial::Settings settings = counting(trials % 3 == 0 ? 0u : (trials % 3 == 1 ? 0x02u : 0x40u));
+        MaterialSettings settings = counting(trials % 3 == 0 ? 0u : (trials % 3 == 1 ? 0x02u : 0x40u));
         settings.wireframe = true;
         settings.screenSpace = screenSpace;
         settings.wireSize = screenSpace ? size(rng) : 0.05f * size(rng);
@@ -240,7 +240,7 @@ TEST(RsRenderRegions, WireRingsCoverABandAlongTheEdges) {
         if (!whole && area2 / perimeter < 1.5 * width) continue;
         ++trials;
         Picture picture(kRect);
-        render(makeScene({makeInstance(makeMesh(corners, {0, 1, 2}), settings)}), kProjection, kRect, picture);
+        render(makeScene({drawn(makeMesh(corners, {0, 1, 2}), settings)}), kProjection, kRect, picture);
         for (int py = kRect.y0; py < kRect.y1; ++py)
             for (int px = kRect.x0; px < kRect.x1; ++px) {
                 const float count = picture.at(px, py).r;
@@ -260,7 +260,7 @@ TEST(RsRenderRegions, WireRingsCoverABandAlongTheEdges) {
 
 // Overlapping triangles of every drawing path, some transparent: any window of the picture drawn
 // as one region of its own equals that part of the picture drawn whole in many regions.
-TEST(RsRenderRegions, PictureInManyRegionsEqualsEachWindowInOne) {
+TEST(RsSceneRenderer, PictureInManyRegionsEqualsEachWindowInOne) {
     std::mt19937 rng(47);
     std::uniform_real_distribution<float> xy(-3.0f, 3.0f), depth(-8.0f, 0.3f), unit(0.0f, 1.0f);
     const Rect rect{-37, 420, 11, 300};  // 132073 pixels: sixteen regions
@@ -269,13 +269,13 @@ TEST(RsRenderRegions, PictureInManyRegionsEqualsEachWindowInOne) {
         for (int i = 0; i < 16; ++i) {
             std::vector<GePoint3<float>> corners;
             for (int k = 0; k < 3; ++k) corners.emplace_back(xy(rng), xy(rng), depth(rng));
-            ProbeMaterial::Settings settings;
+            MaterialSettings settings;
             settings.colour = {unit(rng), unit(rng), unit(rng), i % 2 ? 1.0f : unit(rng)};
             settings.needed = (i % 3 == 0) ? 0x01u : (i % 3 == 1 ? 0x3eu : 0x7fu);
             settings.wireframe = i % 4 == 3;
             settings.screenSpace = i % 8 == 3;
             settings.wireSize = settings.screenSpace ? 3.0f : 0.2f;
-            instances.push_back(makeInstance(makeMesh(corners, {0, 1, 2}, corners), settings));
+            instances.push_back(drawn(makeMesh(corners, {0, 1, 2}, corners), settings));
         }
         const RCShdPtr<RsScene> scene = makeScene(instances);
         Picture whole(rect);

@@ -1,0 +1,591 @@
+#pragma once
+// Support of the renderer's tests: a test material, scene makers, a float picture to render into,
+// tiles of the nine pixel formats read channel by channel, texture doubles, and the independent
+// oracles that several tests share: the layered "over" composite, the exact fill rule of the
+// rasterizer, and corner arithmetic in double.
+#include <algorithm>
+#include <atomic>
+#include <bit>
+#include <cmath>
+#include <cstdint>
+#include <cstring>
+#include <functional>
+#include <optional>
+#include <random>
+#include <type_traits>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "coRgbaColorTyped.h"
+#include "exRenderCancelled.h"
+#include "geAffineMatrix3.h"
+#include "geAlignedBox3.h"
+#include "geProjectiveMatrix3.h"
+#include "geRectangle.h"
+#include "ixPixelConvert.h"
+#include "ixPixelFormat.h"
+#include "ixReadGuard.h"
+#include "ixTile.h"
+#include "ixWriteGuard.h"
+#include "oPtr.h"
+#include "pxInterruptHandler.h"
+#include "pxRequestMgr.h"
+#include "rcShdPtr.h"
+#include "rsGeomInstance.h"
+#include "rsMaterialShader.h"
+#include "rsRasterizer.h"
+#include "rsRenderer.h"
+#include "rsScene.h"
+#include "sdInstanceAttributes.h"
+#include "sdMaterial.h"
+#include "sdMeshBuilder.h"
+#include "sdTextureParams.h"
+#include "sdTextureSampler.h"
+
+namespace Zr::RsTest {
+
+using Rgba = CoRgbaColorTyped<float>;
+
+// ---- Materials and scenes ------------------------------------------------------------------------
+
+// A material answers `colour`, or probe(context) when a probe is given, so that a picture shows
+// what the drawing paths handed to the shader; it counts its shade calls.
+struct MaterialSettings {
+    MaterialSettings(const Rgba& c = {1.0f, 1.0f, 1.0f, 1.0f}) : colour(c) {}
+    Rgba colour;
+    std::function<Rgba(const RsShadingContext&)> probe;
+    SdMaterial::TransferMode mode = SdMaterial::TransferMode::normal;
+    unsigned int needed = 0;
+    bool wireframe = false;
+    bool screenSpace = true;
+    float wireSize = 1.0f;
+};
+
+class TestMaterial : public RsMaterialShader {
+public:
+    explicit TestMaterial(const MaterialSettings& s = {}) : RsMaterialShader(material(s)), _settings(s) {}
+    Rgba shade(RsShadingContext& context) override {
+        ++_calls;
+        return _settings.probe ? _settings.probe(context) : _settings.colour;
+    }
+    unsigned int getNeededContext() const override { return _settings.needed; }
+    int _calls = 0;
+
+protected:
+    void lockMemoryImpl() override {}
+    void unlockMemoryImpl() override {}
+
+private:
+    static RCShdPtr<const SdMaterial> material(const MaterialSettings& s) {
+        RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
+        m->_transferMode = s.mode;
+        m->_wireframe = s.wireframe;
+        m->_screenSpace = s.screenSpace;
+        m->_wireSize = s.wireSize;
+        return m;
+    }
+    MaterialSettings _settings;
+};
+
+// The add mode with colour 1: a pixel's red counts the fragments drawn there.
+inline MaterialSettings counting(unsigned int needed = 0) {
+    MaterialSettings s;
+    s.mode = SdMaterial::TransferMode::add;
+    s.needed = needed;
+    return s;
+}
+
+inline RCShdPtr<const SdMesh> makeMesh(const std::vector<GePoint3<float>>& vertices,
+                                       const std::vector<std::uint32_t>& triangles,
+                                       const std::vector<GePoint3<float>>& texCoords = {}) {
+    SdMeshBuilder builder;
+    builder.setVertices(vertices).setTriangles(triangles);
+    if (!texCoords.empty()) builder.addTextureChannel(texCoords);
+    return builder.build();
+}
+
+// A mesh whose vertices are the corners of [min, max] (corner c takes bit 0 for x, 1 for y, 2 for
+// z), so that its box is exactly that.
+inline RCShdPtr<const SdMesh> makeBoxMesh(const GePoint3<float>& min, const GePoint3<float>& max) {
+    std::vector<GePoint3<float>> corners;
+    for (int c = 0; c < 8; ++c)
+        corners.emplace_back(c & 1 ? max.x : min.x, c & 2 ? max.y : min.y, c & 4 ? max.z : min.z);
+    return makeMesh(corners, {0, 1, 3, 4, 7, 6});
+}
+
+inline SdInstanceAttributes makeAttributes(std::int32_t renderOrder, bool visible = true, bool castsShadows = true) {
+    SdInstanceAttributes a;
+    a._renderOrder = renderOrder;
+    a._visible = visible;
+    a._castsShadows = castsShadows;
+    return a;
+}
+
+inline RCShdPtr<RsGeomInstance> makeInstance(const RCShdPtr<const SdMesh>& mesh,
+                                             const GeAffineMatrix3<float>& matrix = {},
+                                             const SdInstanceAttributes& attributes = {},
+                                             const RsGeomInstance::MaterialList& materials = {}) {
+    return makeShared<RsGeomInstance>(matrix, mesh, materials, RsGeomInstance::MaterialList{}, attributes,
+                                      std::vector<unsigned int>{});
+}
+
+// An instance drawn with one test material.
+inline RCShdPtr<RsGeomInstance> drawn(const RCShdPtr<const SdMesh>& mesh, const MaterialSettings& settings,
+                                      const GeAffineMatrix3<float>& matrix = {}) {
+    return makeInstance(mesh, matrix, {}, {makeShared<TestMaterial>(settings)});
+}
+
+inline RCShdPtr<RsScene> makeScene(std::vector<RCShdPtr<RsGeomInstance>> instances, RsScene::LightList lights = {}) {
+    RsScene::CameraList cameras;
+    return makeShared<RsScene>(instances, lights, cameras);
+}
+
+// Camera space to -1..1: a perspective of vertical opening fov (radians) and aspect 1.
+inline GeProjectiveMatrix3<double> perspective(double fov, double n, double f) {
+    const double c = 1.0 / std::tan(fov * 0.5);
+    return {c, 0, 0, 0, 0, c, 0, 0, 0, 0, (f + n) / (n - f), 2 * f * n / (n - f), 0, 0, -1, 0};
+}
+
+// Corner c of box (bit 0 picks the x end, bit 1 y, bit 2 z) and p through m, in double.
+inline GePoint3<double> cornerOf(const GeAlignedBox3<float>& box, int c) {
+    return {c & 1 ? box.xMax : box.xMin, c & 2 ? box.yMax : box.yMin, c & 4 ? box.zMax : box.zMin};
+}
+inline GePoint3<double> applyInDouble(const GeAffineMatrix3<float>& m, const GePoint3<double>& p) {
+    double out[3];
+    for (int row = 0; row < 3; ++row)
+        out[row] = double(m(row, 0)) * p.x + double(m(row, 1)) * p.y + double(m(row, 2)) * p.z + double(m(row, 3));
+    return {out[0], out[1], out[2]};
+}
+
+// ---- Pictures and tiles --------------------------------------------------------------------------
+
+struct Format {
+    int comps;
+    int depth;
+    IxPixelFormat pixelFormat() const {
+        return IxPixelFormat(static_cast<IxPixelFormat::Comps>(comps), static_cast<IxPixelFormat::Depth>(depth));
+    }
+};
+
+inline const std::vector<Format>& allFormats() {
+    static const std::vector<Format> formats{{1, 8}, {3, 8}, {4, 8}, {1, 16}, {3, 16}, {4, 16}, {1, 32}, {3, 32}, {4, 32}};
+    return formats;
+}
+
+// The RGBA channel that channel c of a pixel of comps channels holds.
+inline int rgbaIndexOf(int comps, int c) { return comps == 1 ? 3 : c; }
+inline float& channelOf(Rgba& colour, int i) { return i == 0 ? colour.r : i == 1 ? colour.g : i == 2 ? colour.b : colour.a; }
+inline float channelOf(const Rgba& colour, int i) { return channelOf(const_cast<Rgba&>(colour), i); }
+
+// A write guard on a new tile of zeros; the guard keeps the pixels after the tile object is gone.
+inline IxWriteGuard makeTile(const Format& format, const GeRectangle<int>& rectangle, const Rgba& initial = {}) {
+    IxTile tile(format.pixelFormat(), rectangle, initial);
+    return IxWriteGuard(tile);
+}
+
+// Raw bits of channel c of pixel (x, y), widened to 32 bits, and their setter.
+inline std::uint32_t rawChannel(const IxWriteGuard& g, int x, int y, int c) {
+    const int bytes = g._pixelFormat._depth / 8;
+    std::uint32_t v = 0;
+    std::memcpy(&v, g.getPixelAddress(x, y) + c * bytes, bytes);  // little-endian
+    return v;
+}
+inline void setRawChannel(const IxWriteGuard& g, int x, int y, int c, std::uint32_t v) {
+    const int bytes = g._pixelFormat._depth / 8;
+    std::memcpy(g.getPixelAddress(x, y) + c * bytes, &v, bytes);
+}
+
+// A channel's raw bits read as a float by the conversions of its depth, and the bits that a
+// replacing writer stores for v.
+inline float bitsToFloat(int depth, std::uint32_t bits) {
+    if (depth == 8) return IxPixelConvert::byteToFloat(static_cast<std::uint8_t>(bits));
+    if (depth == 16) return IxPixelConvert::halfToFloat(static_cast<std::uint16_t>(bits));
+    return std::bit_cast<float>(bits);
+}
+inline std::uint32_t floatToBits(int depth, float v) {
+    if (depth == 8) return IxPixelConvert::floatToByte(v);
+    if (depth == 16) return IxPixelConvert::floatToHalf(v);
+    return std::bit_cast<std::uint32_t>(v);
+}
+
+// The bits after an adding writer added v to a channel holding bits: rounding per pass and, for
+// bytes, saturation.
+inline std::uint32_t addToBits(int depth, std::uint32_t bits, float v) {
+    if (depth == 8) return std::min(255u, bits + IxPixelConvert::floatToByte(v));
+    if (depth == 16) {
+        const float rounded = IxPixelConvert::halfToFloat(IxPixelConvert::floatToHalf(v));
+        return IxPixelConvert::floatToHalf(IxPixelConvert::halfToFloat(static_cast<std::uint16_t>(bits)) + rounded);
+    }
+    return std::bit_cast<std::uint32_t>(std::bit_cast<float>(bits) + v);
+}
+
+// The straight colour that a pixel's stored channels stand for: missing alpha 1, missing colour 0.
+inline Rgba pixelColour(const IxWriteGuard& g, int x, int y) {
+    const int comps = g._pixelFormat._comps;
+    Rgba colour(0.0f, 0.0f, 0.0f, 1.0f);
+    for (int c = 0; c < comps; ++c)
+        channelOf(colour, rgbaIndexOf(comps, c)) = bitsToFloat(g._pixelFormat._depth, rawChannel(g, x, y, c));
+    return colour;
+}
+
+// Random raw bits in every channel of the tile, or (finite) values in [lo, hi).
+inline void fillRandomBits(const IxWriteGuard& g, std::mt19937& rng) {
+    const GeRectangle<int>& r = g._rectangle;
+    for (int y = r.y0; y < r.y1; ++y)
+        for (int x = r.x0; x < r.x1; ++x)
+            for (int c = 0; c < g._pixelFormat._comps; ++c) setRawChannel(g, x, y, c, static_cast<std::uint32_t>(rng()));
+}
+inline void fillRandomValues(const IxWriteGuard& g, std::mt19937& rng, float lo, float hi) {
+    std::uniform_real_distribution<float> value(lo, hi);
+    const GeRectangle<int>& r = g._rectangle;
+    for (int y = r.y0; y < r.y1; ++y)
+        for (int x = r.x0; x < r.x1; ++x)
+            for (int c = 0; c < g._pixelFormat._comps; ++c)
+                setRawChannel(g, x, y, c, floatToBits(g._pixelFormat._depth, value(rng)));
+}
+
+// All bytes of the tile's block, for checks that nothing changed.
+inline std::vector<unsigned char> snapshot(const IxWriteGuard& g) {
+    const unsigned char* first = g.getPixelAddress(g._rectangle.x0, g._rectangle.y0);
+    return std::vector<unsigned char>(first, first + std::size_t(g._rowStride) * g._rectangle.getHeight());
+}
+
+// A float RGBA picture over rect, every pixel `initial`.
+struct Picture {
+    explicit Picture(const GeRectangle<int>& rect, const Rgba& initial = {0.0f, 0.0f, 0.0f, 0.0f})
+        : guard(makeTile({4, 32}, rect, initial)) {}
+    Rgba at(int x, int y) const { return pixelColour(guard, x, y); }
+    bool operator==(const Picture& o) const { return snapshot(guard) == snapshot(o.guard); }
+    IxWriteGuard guard;
+};
+
+inline void render(const RCShdPtr<RsScene>& scene, const GeProjectiveMatrix3<double>& projection,
+                   const GeRectangle<int>& rectangle, Picture& picture) {
+    RsRenderer().render(GeAffineMatrix3<float>(), projection, scene, rectangle, picture.guard);
+}
+
+// The reference composite: straight layers laid with "over", far to near, onto a straight start
+// colour, in double; the result straight again.
+inline Rgba overComposite(const Rgba& start, const std::vector<Rgba>& layers) {
+    double r = start.r * start.a, g = start.g * start.a, b = start.b * start.a, a = start.a;
+    for (const Rgba& s : layers) {
+        r = s.r * s.a + r * (1 - s.a);
+        g = s.g * s.a + g * (1 - s.a);
+        b = s.b * s.a + b * (1 - s.a);
+        a = s.a + a * (1 - s.a);
+    }
+    return Rgba(float(r / a), float(g / a), float(b / a), float(a));
+}
+
+inline void expectNearRgba(const Rgba& got, const Rgba& want, double tolerance, const std::string& where) {
+    EXPECT_NEAR(got.r, want.r, tolerance) << where;
+    EXPECT_NEAR(got.g, want.g, tolerance) << where;
+    EXPECT_NEAR(got.b, want.b, tolerance) << where;
+    EXPECT_NEAR(got.a, want.a, tolerance) << where;
+}
+
+// ---- Texture doubles -----------------------------------------------------------------------------
+
+// Answers every lookup with one colour; counts the shader lookups and keeps their arguments, and
+// counts tile releases and its own destruction in counters that may outlive it.
+class ConstantSampler : public SdTextureSampler {
+public:
+    explicit ConstantSampler(const Rgba& colour, std::atomic<int>* releases = nullptr,
+                             std::atomic<int>* destructions = nullptr)
+        : _colour(colour), _releases(releases), _destructions(destructions) {}
+    ~ConstantSampler() override {
+        if (_destructions) ++*_destructions;
+    }
+    using SdTextureSampler::sample;
+    Rgba sample(const GePoint2<double>&, double, double) const override { return _colour; }
+    Rgba sample(int, int) const override { return _colour; }
+    Rgba sample(const GePoint2<double>& texCoord, const GeLinearMatrix2<double>& derivatives) const override {
+        ++_lookups;
+        _lastTexCoord = texCoord;
+        _lastDerivatives = derivatives;
+        return _colour;
+    }
+    void lockTiles() const override {}
+    void releaseTiles() const override {
+        if (_releases) ++*_releases;
+    }
+    mutable int _lookups = 0;
+    mutable GePoint2<double> _lastTexCoord;
+    mutable GeLinearMatrix2<double> _lastDerivatives;
+
+private:
+    Rgba _colour;
+    std::atomic<int>* _releases;
+    std::atomic<int>* _destructions;
+};
+
+// A map of the given weight whose samplers are ConstantSamplers; with handOutNone it answers a
+// null sampler, as a faulty host map might.
+class ConstantParams : public SdTextureParams {
+public:
+    explicit ConstantParams(const Rgba& colour, float weight = 1.0f, bool handOutNone = false)
+        : _colour(colour), _handOutNone(handOutNone) {
+        _weight = weight;
+    }
+    OPtr<SdTextureSampler> createSampler() const override {
+        if (_handOutNone) return OPtr<SdTextureSampler>();
+        ++_samplersMade;
+        return makeOwned<ConstantSampler>(_colour, &_releases, &_destructions);
+    }
+    mutable std::atomic<int> _samplersMade{0};
+    mutable std::atomic<int> _releases{0};
+    mutable std::atomic<int> _destructions{0};
+
+private:
+    Rgba _colour;
+    bool _handOutNone;
+};
+
+// ---- The rasterizer's fill rule ------------------------------------------------------------------
+//
+// Test vertices lie on a grid of 1/256 pixel (Pt holds integers in that unit), exact in float and
+// double. The reference works in the rasterizer's walking frame, where samples lie on the
+// integers: w = (x - regionOrigin) * 2^bits - 1/2, held exactly as integers in units of 1/512.
+
+using i64 = std::int64_t;
+constexpr i64 kPixelUnit = 256;
+constexpr i64 kWalkUnit = 512;
+
+struct Pt {
+    i64 x, y;
+};
+
+inline double toPixels(i64 v) { return static_cast<double>(v) / kPixelUnit; }
+inline i64 floorDiv(i64 a, i64 b) { return a >= 0 ? a / b : -((-a + b - 1) / b); }
+inline i64 ceilDiv(i64 a, i64 b) { return -floorDiv(-a, b); }
+// The walking-frame coordinate, in kWalkUnit, of an absolute coordinate in 1/256 pixel.
+inline i64 walk(i64 v, int origin, int bits) { return 2 * (v - kPixelUnit * origin) * (i64(1) << bits) - kPixelUnit; }
+
+// A random position in [lo, hi) pixels on the 1/256 grid.
+inline i64 randomCoord(std::mt19937& rng, double lo, double hi) {
+    return std::uniform_int_distribution<i64>(static_cast<i64>(lo * kPixelUnit), static_cast<i64>(hi * kPixelUnit) - 1)(rng);
+}
+
+// A vertex of the given kind at p; 3D kinds get w = 1 and depth z.
+template <class Vertex>
+Vertex makeVertex(Pt p, double z = 0.0) {
+    Vertex v{};
+    if constexpr (std::is_same_v<Vertex, Rs2DVertex>) {
+        v._x = static_cast<float>(toPixels(p.x));
+        v._y = static_cast<float>(toPixels(p.y));
+    } else {
+        v._pixCoord = GeHomogeneousCoord3<double>(toPixels(p.x), toPixels(p.y), z, 1.0);
+        v._w = 1.0;
+    }
+    return v;
+}
+
+// The fill rule in exact arithmetic, by edge functions: a sample is covered when it lies strictly
+// inside all three edges, or on an edge that is a left edge or a top edge.
+class ReferenceTriangle {
+public:
+    ReferenceTriangle(Pt a, Pt b, Pt c, int originX, int originY, int xBits, int yBits)
+        : _v{{walk(a.x, originX, xBits), walk(a.y, originY, yBits)},
+             {walk(b.x, originX, xBits), walk(b.y, originY, yBits)},
+             {walk(c.x, originX, xBits), walk(c.y, originY, yBits)}} {
+        const i64 area = edge(_v[0], _v[1], _v[2]);
+        if (area < 0) std::swap(_v[1], _v[2]);
+        _valid = area != 0;
+    }
+    bool isValid() const { return _valid; }
+
+    // Sample (sx, sy): region-relative sample indices.
+    bool covers(i64 sx, i64 sy) const {
+        if (!_valid) return false;
+        const Pt p{sx * kWalkUnit, sy * kWalkUnit};
+        for (int i = 0; i < 3; ++i) {
+            const Pt& a = _v[i];
+            const Pt& b = _v[(i + 1) % 3];
+            const i64 e = edge(a, b, p);
+            // With the interior on the positive side, an edge going up has it on its right (a left
+            // edge); a horizontal edge going right has it below (a top edge).
+            if (e < 0 || (e == 0 && !(b.y < a.y || (b.y == a.y && b.x > a.x)))) return false;
+        }
+        return true;
+    }
+
+    // Horizontal distance, in samples, from the sample to the nearest edge line that is not
+    // horizontal.
+    double horizontalDistance(i64 sx, i64 sy) const {
+        double best = 1e300;
+        const Pt p{sx * kWalkUnit, sy * kWalkUnit};
+        for (int i = 0; i < 3; ++i) {
+            const Pt& a = _v[i];
+            const Pt& b = _v[(i + 1) % 3];
+            if (a.y != b.y)
+                best = std::min(best, std::abs(double(edge(a, b, p))) / std::abs(double(b.y - a.y)) / kWalkUnit);
+        }
+        return best;
+    }
+
+    // The sample rows and columns that can be covered: [rowBegin, rowEnd) x [colBegin, colEnd).
+    i64 rowBegin() const { return ceilDiv(std::min({_v[0].y, _v[1].y, _v[2].y}), kWalkUnit); }
+    i64 rowEnd() const { return ceilDiv(std::max({_v[0].y, _v[1].y, _v[2].y}), kWalkUnit); }
+    i64 colBegin() const { return ceilDiv(std::min({_v[0].x, _v[1].x, _v[2].x}), kWalkUnit); }
+    i64 colEnd() const { return ceilDiv(std::max({_v[0].x, _v[1].x, _v[2].x}), kWalkUnit) + 1; }
+
+    // A bound, in samples, on how far walked edges of relative rounding epsilon may stray.
+    double roundingBound(double epsilon) const {
+        double maxX = 0, maxSlope = 0;
+        for (int i = 0; i < 3; ++i) {
+            const Pt& a = _v[i];
+            const Pt& b = _v[(i + 1) % 3];
+            maxX = std::max(maxX, std::abs(double(a.x)) / kWalkUnit);
+            if (a.y != b.y) maxSlope = std::max(maxSlope, std::abs(double(b.x - a.x) / double(b.y - a.y)));
+        }
+        return (double(rowEnd() - rowBegin()) + 2.0) * (maxX + maxSlope + 1.0) * epsilon * 4.0;
+    }
+
+private:
+    static i64 edge(const Pt& a, const Pt& b, const Pt& p) { return (b.x - a.x) * (p.y - a.y) - (b.y - a.y) * (p.x - a.x); }
+    Pt _v[3];
+    bool _valid;
+};
+
+// A buffer that records what the rasterizer delivers: a count per sample at the span's grain,
+// every delivery if asked, and a per-pixel hook that sees the pixel data stepped along the span.
+//
+// Sub-pixel spans are read the way an A-buffer reads them: pixels from the one holding _minX1
+// while below _maxX2, each sample tested against its sub-scanline's ends; a pixel that such a
+// consumer would take as interior (inside [_maxX1, _minX2) on every sub-scanline) must be covered
+// whole.
+template <class Vertex, class PixelSpan>
+class RecordingBuffer {
+public:
+    struct Context {
+        int tag = 0;
+    };
+    using PixelData = RsPixelData<Vertex>;
+    using Rasterizer = RsRasterizer<RecordingBuffer, Vertex, PixelSpan>;
+    static constexpr int kXBits = PixelSpan::kSubPixelBits;
+    static constexpr int kYBits = PixelSpan::kSubScanlineBits;
+    struct Delivery {
+        int row;
+        PixelSpan span;
+    };
+
+    explicit RecordingBuffer(GeRectangle<int> region)
+        : _samplesX(region.getWidth() << kXBits), _samplesY(region.getHeight() << kYBits),
+          _counts(static_cast<std::size_t>(_samplesX) * _samplesY, 0) {}
+
+    void drawSpan(const Context& context, int row, const PixelSpan& span, PixelData& data) {
+        if (_expectedContext && &context != _expectedContext) ++_errors;
+        if (_keepDeliveries) _deliveries.push_back({row, span});
+        if (_pendingFirstRow) _rowOffset = *_pendingFirstRow - row;
+        _pendingFirstRow.reset();
+        row += _rowOffset;
+        if constexpr (kXBits == 0) {
+            for (int x = span._x1; x < span._x2; ++x, data.stepX()) {
+                hit(x, row);
+                if (_onPixel) _onPixel(x, row, data);
+            }
+        } else {
+            constexpr int kCells = 1 << kXBits, kRows = 1 << kYBits;
+            const bool allRows = span._x1[0] != -1 && span._x1[kRows - 1] != -1;
+            for (int px = (span._minX1 >> kXBits) << kXBits; px < span._maxX2; px += kCells, data.stepX()) {
+                int covered = 0;
+                for (int r = 0; r < kRows; ++r)
+                    for (int s = px; s < px + kCells; ++s)
+                        if (span._x1[r] <= s && s < span._x2[r]) hit(s, (row << kYBits) + r), ++covered;
+                if (allRows && px >= span._maxX1 && px + kCells <= (span._minX2 & ~(kCells - 1)) &&
+                    covered != kCells * kRows)
+                    ++_errors;
+                if (_onPixel) _onPixel(px >> kXBits, row, data);
+            }
+        }
+    }
+
+    int count(int sx, int sy) const { return _counts[static_cast<std::size_t>(sy) * _samplesX + sx]; }
+    void clear() {
+        std::fill(_counts.begin(), _counts.end(), 0);
+        _deliveries.clear();
+        _errors = _hits = 0;
+    }
+    // For spans whose delivered rows are not their true rows (8 x 4 cells): the next span lies at
+    // true pixel row trueRow, and the following ones keep the same offset.
+    void expectFirstRow(int trueRow) { _pendingFirstRow = trueRow; }
+
+    int _samplesX, _samplesY;
+    std::vector<int> _counts;
+    long _hits = 0;
+    long _errors = 0;  // samples out of range, uncovered interior pixels, wrong contexts
+    bool _keepDeliveries = false;
+    std::vector<Delivery> _deliveries;
+    const Context* _expectedContext = nullptr;
+    std::function<void(int, int, const PixelData&)> _onPixel;
+
+private:
+    void hit(int sx, int sy) {
+        if (sx < 0 || sy < 0 || sx >= _samplesX || sy >= _samplesY) {
+            ++_errors;
+            return;
+        }
+        ++_counts[static_cast<std::size_t>(sy) * _samplesX + sx];
+        ++_hits;
+    }
+    std::optional<int> _pendingFirstRow;
+    int _rowOffset = 0;
+};
+
+// A recording buffer with its rasterizer over a region, drawing triangles given on the test grid.
+template <class Vertex, class PixelSpan>
+class Harness {
+public:
+    using Buffer = RecordingBuffer<Vertex, PixelSpan>;
+    static constexpr int kXBits = PixelSpan::kSubPixelBits;
+    static constexpr int kYBits = PixelSpan::kSubScanlineBits;
+    static constexpr bool kSubPixel = kXBits != 0;
+    // Relative rounding of the edge walk: float for whole pixels, double for sub-pixels.
+    static constexpr double kEpsilon = kSubPixel ? 0x1p-52 : 0x1p-23;
+
+    // Spans whose rows are not delivered at their place (8 x 4 cells) can only be put back by the
+    // buffer when a triangle arrives in one block: they get a block of 4096 rows.
+    Harness(GeRectangle<int> region, int blockWidth, int blockHeight)
+        : _region(region), _buffer(region),
+          _rasterizer(_buffer, &Buffer::drawSpan, region, blockWidth, kXBits != kYBits ? 4096 : blockHeight) {
+        _buffer._expectedContext = &_context;
+    }
+
+    ReferenceTriangle reference(Pt a, Pt b, Pt c) const {
+        return ReferenceTriangle(a, b, c, _region.x0, _region.y0, kXBits, kYBits);
+    }
+    void draw(Pt a, Pt b, Pt c) {
+        if constexpr (kXBits != kYBits)
+            _buffer.expectFirstRow(static_cast<int>(floorDiv(reference(a, b, c).rowBegin(), i64(1) << kYBits)));
+        _rasterizer.rasterizeTriangle(_context, makeVertex<Vertex>(a), makeVertex<Vertex>(b), makeVertex<Vertex>(c));
+    }
+
+    GeRectangle<int> _region;
+    Buffer _buffer;
+    typename Buffer::Rasterizer _rasterizer;
+    typename Buffer::Context _context{7};
+};
+
+// Counts interrupt checks, and throws a cancel at the check numbered throwAt (1-based) if set.
+class CountingInterruptHandler : public PxInterruptHandler {
+public:
+    void onInterruptCheck() override {
+        if (++_checks == _throwAt) throw ExRenderCancelled("test cancel");
+    }
+    long _checks = 0;
+    long _throwAt = -1;
+};
+
+// Installs a handler on the request manager for the lifetime of the scope.
+class InterruptHandlerScope {
+public:
+    explicit InterruptHandlerScope(const RCShdPtr<PxInterruptHandler>& h) { PxRequestMgr::getInstance()->setInterruptHandler(h); }
+    ~InterruptHandlerScope() { PxRequestMgr::getInstance()->setInterruptHandler(nullptr); }
+    InterruptHandlerScope(const InterruptHandlerScope&) = delete;
+    InterruptHandlerScope& operator=(const InterruptHandlerScope&) = delete;
+};
+
+}  // namespace Zr::RsTest
