@@ -57,12 +57,22 @@ public:
     // Clips the polygon against the active planes; returns the number of its vertices left.
     int clip() {
         // A polygon inside every active plane comes out as it went in, and most are.
-        if (isInside()) return getVertexCount();
-        static constexpr unsigned int order[6] = {zMinBit, zMaxBit, xMinBit, xMaxBit, yMinBit, yMaxBit};
-        for (int plane = 0; plane < 6; ++plane) {
-            if ((_clipFlags & order[plane]) == 0) continue;
-            clipAgainst(order[plane]);
-            if (_polygon.empty()) break;
+        if (!isInside()) {
+            static constexpr unsigned int order[6] = {zMinBit, zMaxBit, xMinBit, xMaxBit, yMinBit, yMaxBit};
+            for (int plane = 0; plane < 6; ++plane) {
+                if ((_clipFlags & order[plane]) == 0) continue;
+                clipAgainst(order[plane]);
+                if (_polygon.empty()) break;
+            }
+        }
+        // A vertex without a positive w (the eye itself, which lies on every plane, or a crossing
+        // that rounding put there) has no place on the screen: the polygon is seen edge-on through
+        // the eye and draws nothing.
+        for (int index : _polygon) {
+            if (!(_vertices[static_cast<std::size_t>(index)]._pixCoord.w > 0.0)) {
+                _polygon.clear();
+                break;
+            }
         }
         return getVertexCount();
     }
@@ -109,6 +119,14 @@ private:
         }
     }
 
+    // Puts p exactly on the plane with the given bit. A crossing mixed from far-out positions
+    // rounds by more than the region is wide and could stay outside the plane it was made for.
+    void placeOnPlane(GeHomogeneousCoord3<double>& p, unsigned int bit) const {
+        double& coordinate = bit <= xMaxBit ? p.x : bit <= yMaxBit ? p.y : p.z;
+        const int limit = bit == xMinBit ? 0 : bit == xMaxBit ? 1 : bit == yMinBit ? 2 : bit == yMaxBit ? 3 : bit == zMinBit ? 4 : 5;
+        coordinate = _clipRegion[limit] * p.w;
+    }
+
     void clipAgainst(unsigned int bit) {
         const std::size_t count = _polygon.size();
         _scratch.clear();
@@ -132,6 +150,7 @@ private:
                     Vertex crossing{};
                     rsMixVertex(crossing, _vertices[static_cast<std::size_t>(prevIndex)], a,
                                 _vertices[static_cast<std::size_t>(curIndex)], b);
+                    placeOnPlane(crossing._pixCoord, bit);
                     _vertices.push_back(crossing);
                     _scratch.push_back(static_cast<int>(_vertices.size() - 1));
                 }
