@@ -152,51 +152,62 @@ TEST(RsSceneRenderer, ClippedTrianglesDrawExactlyTheirVisiblePart) {
     EXPECT_GT(fragments, 1000);
 }
 
-// A textured parallelogram at a grazing angle: at every pixel centre the texture coordinates and
-// their screen derivatives are those of the exact projective map.
-TEST(RsSceneRenderer, TextureCoordinatesArePerspectiveCorrect) {
+// A textured parallelogram at a grazing angle: at every pixel centre the texture coordinates, the
+// eye position and their screen derivatives are those of the exact projective map.
+TEST(RsSceneRenderer, ShadingInputsArePerspectiveCorrect) {
     // From z = -1.2 to z = -62.8, turned about y as well, so that 1/w changes along both axes.
     const std::vector<GePoint3<float>> corners = {{-2, -0.8f, -1.2f}, {2, -0.8f, -2.8f}, {2, 0.2f, -62.8f}, {-2, 0.2f, -61.2f}};
     const RCShdPtr<const SdMesh> mesh = makeMesh(corners, {0, 1, 2, 0, 2, 3}, {{0, 0, 0}, {3, 0, 0}, {3, 7, 0}, {0, 7, 0}});
-    // (s, t) of the plane point seen through pixel position (x, y): p - a = alpha u + beta v.
+    // (s, t) and the eye point P of the plane point seen through pixel position (x, y):
+    // P - a = alpha u + beta v.
     const V3 a = toV3(corners[0]), u = toV3(corners[1]) - a, v = toV3(corners[3]) - a, n = u.cross(v);
     auto exact = [&](double x, double y) {
         const V3 ray = rayThrough(x, y);
-        const V3 q = ray * (n.dot(a) / n.dot(ray)) - a;
+        const V3 p = ray * (n.dot(a) / n.dot(ray));
+        const V3 q = p - a;
         const double uu = u.dot(u), uv = u.dot(v), vv = v.dot(v), det = uu * vv - uv * uv;
-        return std::array<double, 2>{3.0 * (q.dot(u) * vv - q.dot(v) * uv) / det, 7.0 * (q.dot(v) * uu - q.dot(u) * uv) / det};
+        return std::array<double, 5>{3.0 * (q.dot(u) * vv - q.dot(v) * uv) / det,
+                                     7.0 * (q.dot(v) * uu - q.dot(u) * uv) / det, p.x, p.y, p.z};
     };
-    // Two pictures: (s, t, ds/dx) and (dt/dx, ds/dy, dt/dy).
-    const std::function<Rgba(const RsShadingContext&)> probes[2] = {
+    // Five pictures: (s, t, ds/dx), (dt/dx, ds/dy, dt/dy), P, dP/dx, dP/dy.
+    const auto rgb = [](const auto& v) { return Rgba(float(v.x), float(v.y), float(v.z), 1); };
+    const std::function<Rgba(const RsShadingContext&)> probes[5] = {
         [](const RsShadingContext& c) {
             return Rgba(float(c._texCoord.x), float(c._texCoord.y), float(c._texCoordDerivatives(0, 0)), 1);
         },
         [](const RsShadingContext& c) {
             const GeLinearMatrix2<double>& d = c._texCoordDerivatives;
             return Rgba(float(d(0, 1)), float(d(1, 0)), float(d(1, 1)), 1);
-        }};
-    Picture pictures[2] = {Picture(kRect), Picture(kRect)};
-    for (int i = 0; i < 2; ++i) {
+        },
+        [&](const RsShadingContext& c) { return rgb(c._eyeCoord); },
+        [&](const RsShadingContext& c) { return rgb(c._dEyeCoord_dx); },
+        [&](const RsShadingContext& c) { return rgb(c._dEyeCoord_dy); }};
+    std::vector<Picture> pictures;
+    for (const auto& probe : probes) {
         MaterialSettings settings;
-        settings.needed = 0x3cu;
-        settings.probe = probes[i];
-        render(makeScene({drawn(mesh, settings)}), kProjection, kRect, pictures[i]);
+        settings.needed = 0x3du;
+        settings.probe = probe;
+        pictures.emplace_back(kRect);
+        render(makeScene({drawn(mesh, settings)}), kProjection, kRect, pictures.back());
     }
     int checked = 0;
     const double h = 1e-3;
     for (int py = kRect.y0; py < kRect.y1; ++py)
         for (int px = kRect.x0; px < kRect.x1; ++px) {
             const double x = px + 0.5, y = py + 0.5;
-            const auto st = exact(x, y);
-            if (st[0] < 0.01 || st[0] > 2.99 || st[1] < 0.01 || st[1] > 6.99) continue;  // off the edges
+            const auto e = exact(x, y);
+            if (e[0] < 0.01 || e[0] > 2.99 || e[1] < 0.01 || e[1] > 6.99) continue;  // off the edges
             // The derivatives against central differences of the exact map.
             const auto dx0 = exact(x - h, y), dx1 = exact(x + h, y), dy0 = exact(x, y - h), dy1 = exact(x, y + h);
-            const double expected[6] = {st[0], st[1], (dx1[0] - dx0[0]) / (2 * h),
-                                        (dx1[1] - dx0[1]) / (2 * h), (dy1[0] - dy0[0]) / (2 * h), (dy1[1] - dy0[1]) / (2 * h)};
-            const Rgba p0 = pictures[0].at(px, py), p1 = pictures[1].at(px, py);
-            const float got[6] = {p0.r, p0.g, p0.b, p1.r, p1.g, p1.b};
-            for (int k = 0; k < 6; ++k)
-                EXPECT_NEAR(got[k], expected[k], 2e-5 + 1e-4 * std::abs(expected[k])) << px << ", " << py << " #" << k;
+            const auto ddx = [&](int k) { return (dx1[k] - dx0[k]) / (2 * h); };
+            const auto ddy = [&](int k) { return (dy1[k] - dy0[k]) / (2 * h); };
+            const double expected[15] = {e[0],   e[1],   ddx(0), ddx(1), ddy(0), ddy(1), e[2],  e[3],
+                                         e[4],   ddx(2), ddx(3), ddx(4), ddy(2), ddy(3), ddy(4)};
+            for (int k = 0; k < 15; ++k) {
+                const Rgba pixel = pictures[static_cast<std::size_t>(k / 3)].at(px, py);
+                const float got = k % 3 == 0 ? pixel.r : k % 3 == 1 ? pixel.g : pixel.b;
+                EXPECT_NEAR(got, expected[k], 2e-5 + 1e-4 * std::abs(expected[k])) << px << ", " << py << " #" << k;
+            }
             ++checked;
         }
     EXPECT_GT(checked, 500);
