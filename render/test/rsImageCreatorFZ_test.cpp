@@ -147,7 +147,7 @@ TEST(RsImageCreatorFZ, FailuresAndEmptyRegionsWriteNothingMore) {
 
     std::mt19937 rng(5);
     const IxWriteGuard output = makeTile({4, 8}, {0, 4, 0, 4});
-    fillRandomBits(output, rng);
+    fillRandomValues(output, rng, 0.0f, 1.0f);
     const std::vector<unsigned char> before = snapshot(output);
     for (const GeRectangle<int>& empty : {GeRectangle<int>{1, 1, 0, 4}, GeRectangle<int>{0, 4, 2, 2}})
         RsImageCreatorFZ::createImage(Lists(4, 4).heads.data(), empty, false, 1.0f, true, Rgba(1, 1, 1, 1), IxReadGuard(output), output);

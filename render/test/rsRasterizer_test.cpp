@@ -1,13 +1,12 @@
 // The rasterizer: which samples it covers against the exact fill rule, triangle by triangle and
 // over meshes whose triangles share edges, at whole-pixel and both sub-pixel grains; the pixel
-// data that reaches the buffer; how spans are handed over in blocks and column tiles; and the
-// interrupt check once per scanline, after which a cancel leaves the rasterizer as good as new.
+// data that reaches the buffer; the spans of sub-pixel rows; and the interrupt check once per
+// scanline, after which a cancel leaves the rasterizer as good as new.
 #include <gtest/gtest.h>
 
 #include <array>
 #include <climits>
 #include <cmath>
-#include <map>
 #include <random>
 #include <vector>
 
@@ -433,73 +432,23 @@ TYPED_TEST(RsRasterizerPixelData, AttributesAreLinearAtEveryPixelWhateverTheTili
 
 // ---- How spans are handed over -------------------------------------------------------------------
 
-// Compared with the same triangle delivered in one piece per row: blocks start at the triangle's
-// first row and hold _blockHeight rows (the last one fewer); a block comes tile by tile from its
-// leftmost pixel, each tile _blockWidth wide and each row clamped to it; the pieces of a row make
-// up its whole span, and the rows run without gap to the bottom.
-TEST(RsRasterizerSpans, BlocksAndColumnTilesPartitionTheTriangle) {
-    const GeRectangle<int> region{0, 200, 0, 150};
-    const Pt a{2 * u + 100, 3 * u}, b{190 * u, 60 * u + 77}, c{40 * u + 5, 120 * u + 3};
-    Harness<RsPlainVertex, RsPixelSpan<0, 0>> whole(region, 100000, 100000);
-    whole._buffer._keepDeliveries = true;
-    whole.draw(a, b, c);
-    std::map<int, RsPixelSpan<0, 0>> full;
-    for (const auto& d : whole._buffer._deliveries) full[d.row] = d.span;
-    const ReferenceTriangle ref = whole.reference(a, b, c);
-    const int firstRow = int(ref.rowBegin()), endRow = int(ref.rowEnd());
-    ASSERT_EQ(int(full.size()), endRow - firstRow);
-    for (const auto& [blockWidth, blockHeight] : {std::pair{7, 5}, std::pair{16, 16}, std::pair{1, 1}, std::pair{64, 3}, std::pair{500, 500}}) {
-        Harness<RsPlainVertex, RsPixelSpan<0, 0>> h(region, blockWidth, blockHeight);
-        h._buffer._keepDeliveries = true;
-        h.draw(a, b, c);
-        EXPECT_EQ(h._buffer._errors, 0);
-        EXPECT_EQ(h._buffer._counts, whole._buffer._counts);
-        const auto& got = h._buffer._deliveries;
-        std::size_t next = 0;
-        for (int blockStart = firstRow; blockStart < endRow; blockStart += blockHeight) {
-            const int blockEnd = std::min(blockStart + blockHeight, endRow);
-            int left = INT_MAX, right = INT_MIN;
-            for (int y = blockStart; y < blockEnd; ++y) left = std::min(left, full.at(y)._x1), right = std::max(right, full.at(y)._x2);
-            std::map<int, int> covered;  // per row, the pixels the pieces cover
-            for (int tile = left; tile < right; tile += blockWidth)
-                for (int y = blockStart; y < blockEnd; ++y, ++next) {
-                    ASSERT_LT(next, got.size());
-                    ASSERT_EQ(got[next].row, y);
-                    const RsPixelSpan<0, 0>& piece = got[next].span;
-                    if (piece._x1 >= piece._x2) continue;
-                    EXPECT_LE(piece._x2, tile + blockWidth);
-                    EXPECT_EQ(piece._x1, std::max(full.at(y)._x1, tile));
-                    covered[y] += piece._x2 - piece._x1;
-                }
-            for (int y = blockStart; y < blockEnd; ++y) EXPECT_EQ(covered[y], std::max(0, full.at(y)._x2 - full.at(y)._x1)) << "row " << y;
-        }
-        EXPECT_EQ(next, got.size()) << "deliveries beyond the triangle's rows";
-    }
-}
-
 // Sub-pixel spans, one per pixel row: the sub-scanlines of the first and last rows that lie outside
 // the triangle hold -1 in both ends, all others are walked, and the four extents are the smallest
-// and largest ends of the walked ones. Column tiles clamp only the extents, in sub-pixels; the
-// pieces of a row meet without overlap and cover what the whole row covers.
-TEST(RsRasterizerSpans, SubPixelSpansMarkMissedSubScanlinesAndTilesClampTheExtents) {
-    const GeRectangle<int> region{10, 50, 20, 44};
-    Harness<RsNormalVertex, RsPixelSpan<4, 4>> whole(region, 1000, 1000), tiled(region, 3, 2);
-    whole._buffer._keepDeliveries = tiled._buffer._keepDeliveries = true;
+// and largest ends of the walked ones.
+TEST(RsRasterizerSpans, SubPixelSpansMarkMissedSubScanlines) {
+    Harness<RsNormalVertex, RsPixelSpan<4, 4>> h({10, 40, 20, 44}, 1000, 1000);
+    h._buffer._keepDeliveries = true;
     // Top at sub-row 5 of pixel row 2 (y = 22 + 5.5/16), bottom inside pixel row 9.
-    const Pt a{12 * u, 22 * u + 88}, b{45 * u + 3, 26 * u + 17}, c{20 * u + 9, 29 * u + 201};
-    whole.draw(a, b, c);
-    tiled.draw(a, b, c);
-    const ReferenceTriangle ref = whole.reference(a, b, c);
+    const Pt a{12 * u, 22 * u + 88}, b{35 * u + 3, 26 * u + 17}, c{20 * u + 9, 29 * u + 201};
+    h.draw(a, b, c);
+    const ReferenceTriangle ref = h.reference(a, b, c);
     ASSERT_EQ(ref.rowBegin(), 2 * 16 + 5);
-    const auto& deliveries = whole._buffer._deliveries;
     const int firstRow = int(ref.rowBegin() >> 4);
-    ASSERT_EQ(int(deliveries.size()), int((ref.rowEnd() - 1) >> 4) - firstRow + 1);
-    std::map<int, RsPixelSpan<4, 4>> byRow;
-    for (std::size_t i = 0; i < deliveries.size(); ++i) {
-        const auto& [row, span] = deliveries[i];
-        byRow[row] = span;
+    ASSERT_EQ(int(h._buffer._deliveries.size()), int((ref.rowEnd() - 1) >> 4) - firstRow + 1);
+    for (std::size_t i = 0; i < h._buffer._deliveries.size(); ++i) {
+        const auto& [row, span] = h._buffer._deliveries[i];
         EXPECT_EQ(row, firstRow + int(i));
-        int minX1 = INT_MAX, maxX1 = INT_MIN, minX2 = INT_MAX, maxX2 = INT_MIN;
+        std::array<int, 4> extents{INT_MAX, INT_MIN, INT_MAX, INT_MIN};
         for (int slot = 0; slot < 16; ++slot) {
             const i64 subRow = i64(row) * 16 + slot;
             if (subRow < ref.rowBegin() || subRow >= ref.rowEnd()) {
@@ -508,32 +457,11 @@ TEST(RsRasterizerSpans, SubPixelSpansMarkMissedSubScanlinesAndTilesClampTheExten
                 continue;
             }
             EXPECT_GE(span._x1[slot], 0);
-            minX1 = std::min(minX1, span._x1[slot]), maxX1 = std::max(maxX1, span._x1[slot]);
-            minX2 = std::min(minX2, span._x2[slot]), maxX2 = std::max(maxX2, span._x2[slot]);
+            extents = {std::min(extents[0], span._x1[slot]), std::max(extents[1], span._x1[slot]),
+                       std::min(extents[2], span._x2[slot]), std::max(extents[3], span._x2[slot])};
         }
-        EXPECT_EQ((std::array<int, 4>{span._minX1, span._maxX1, span._minX2, span._maxX2}), (std::array<int, 4>{minX1, maxX1, minX2, maxX2}));
+        EXPECT_EQ((std::array<int, 4>{span._minX1, span._maxX1, span._minX2, span._maxX2}), extents);
     }
-    std::map<int, std::vector<std::pair<int, int>>> pieces;
-    for (const auto& [row, span] : tiled._buffer._deliveries) {
-        const RsPixelSpan<4, 4>& full = byRow.at(row);
-        for (int slot = 0; slot < 16; ++slot) {
-            EXPECT_EQ(span._x1[slot], full._x1[slot]);
-            EXPECT_EQ(span._x2[slot], full._x2[slot]);
-        }
-        EXPECT_LE(span._minX1, span._maxX1);
-        EXPECT_LE(span._minX2, span._maxX2);
-        if (span._minX1 >= span._maxX2) continue;
-        EXPECT_TRUE(span._minX1 % 16 == 0 || span._minX1 == full._minX1) << "a piece starts inside a pixel";
-        EXPECT_LE(span._maxX2 - (span._minX1 & ~15), 3 * 16);
-        pieces[row].push_back({span._minX1, span._maxX2});
-    }
-    for (auto& [row, list] : pieces) {
-        std::sort(list.begin(), list.end());
-        EXPECT_EQ(list.front().first, byRow.at(row)._minX1);
-        EXPECT_EQ(list.back().second, byRow.at(row)._maxX2);
-        for (std::size_t i = 1; i < list.size(); ++i) EXPECT_EQ(list[i].first, list[i - 1].second);
-    }
-    EXPECT_EQ(whole._buffer._counts, tiled._buffer._counts);
 }
 
 // 8 x 4 spans come at the row that their last sub-scanline gives when shifted by the x bits, minus

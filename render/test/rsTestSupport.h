@@ -3,44 +3,25 @@
 // tiles of the nine pixel formats read channel by channel, texture doubles, and the independent
 // oracles that several tests share: the layered "over" composite, the exact fill rule of the
 // rasterizer, and corner arithmetic in double.
+#include <gtest/gtest.h>
+
 #include <algorithm>
 #include <atomic>
 #include <bit>
-#include <cmath>
-#include <cstdint>
 #include <cstring>
 #include <functional>
 #include <optional>
 #include <random>
-#include <type_traits>
+#include <string>
 #include <vector>
 
-#include <gtest/gtest.h>
-
-#include <string>
-
-#include "coRgbaColorTyped.h"
 #include "exRenderCancelled.h"
-#include "geAffineMatrix3.h"
-#include "geAlignedBox3.h"
-#include "geProjectiveMatrix3.h"
-#include "geRectangle.h"
 #include "ixPixelConvert.h"
-#include "ixPixelFormat.h"
 #include "ixReadGuard.h"
-#include "ixTile.h"
 #include "ixWriteGuard.h"
-#include "oPtr.h"
-#include "pxInterruptHandler.h"
 #include "pxRequestMgr.h"
-#include "rcShdPtr.h"
-#include "rsGeomInstance.h"
-#include "rsMaterialShader.h"
 #include "rsRasterizer.h"
 #include "rsRenderer.h"
-#include "rsScene.h"
-#include "sdInstanceAttributes.h"
-#include "sdMaterial.h"
 #include "sdMeshBuilder.h"
 #include "sdTextureParams.h"
 #include "sdTextureSampler.h"
@@ -231,13 +212,7 @@ inline Rgba pixelColour(const IxWriteGuard& g, int x, int y) {
     return colour;
 }
 
-// Random raw bits in every channel of the tile, or (finite) values in [lo, hi).
-inline void fillRandomBits(const IxWriteGuard& g, std::mt19937& rng) {
-    const GeRectangle<int>& r = g._rectangle;
-    for (int y = r.y0; y < r.y1; ++y)
-        for (int x = r.x0; x < r.x1; ++x)
-            for (int c = 0; c < g._pixelFormat._comps; ++c) setRawChannel(g, x, y, c, static_cast<std::uint32_t>(rng()));
-}
+// Values in [lo, hi) in every channel of the tile.
 inline void fillRandomValues(const IxWriteGuard& g, std::mt19937& rng, float lo, float hi) {
     std::uniform_real_distribution<float> value(lo, hi);
     const GeRectangle<int>& r = g._rectangle;

@@ -14,7 +14,6 @@
 // y minimum 4, y maximum 8, z minimum 16, z maximum 32). The result is a convex polygon, given as
 // a list of vertex indices into the clipper's vertex store; the triangle's own three vertices are
 // indices 0 to 2 and new vertices are appended behind them.
-#include <cmath>
 #include <vector>
 
 #include "geHomogeneousCoord3.h"
@@ -65,9 +64,9 @@ public:
                 if (_polygon.empty()) break;
             }
         }
-        // A vertex without a positive w (the eye itself, which lies on every plane, or a crossing
-        // that rounding put there) has no place on the screen: the polygon is seen edge-on through
-        // the eye and draws nothing.
+        // A vertex without a positive w (the eye itself, which lies on every plane, a crossing that
+        // rounding put there, or one that is not a number) has no place on the screen: the polygon
+        // is seen edge-on through the eye, or lies beyond the float range, and draws nothing.
         for (int index : _polygon) {
             if (!(_vertices[static_cast<std::size_t>(index)]._pixCoord.w > 0.0)) {
                 _polygon.clear();
@@ -140,20 +139,17 @@ private:
             const int curIndex = _polygon[i];
             const double cur = valueOf(_vertices[static_cast<std::size_t>(curIndex)], bit);
             if (prev * cur < 0.0) {
-                // The edge crosses the plane: the new vertex lies where the value is zero. An
-                // infinite value (a position beyond the float range) leaves no such place, only
-                // weights that are not numbers: the crossing is then left out, so that no vertex
-                // that is not a number reaches the division.
+                // The edge crosses the plane: the new vertex lies where the value is zero. Its
+                // weights are not numbers when a value is infinite (a position beyond the float
+                // range); its w is then no number either, and clip() drops the polygon.
                 const double a = cur / (cur - prev);
                 const double b = -prev / (cur - prev);
-                if (std::isfinite(a) && std::isfinite(b)) {
-                    Vertex crossing{};
-                    rsMixVertex(crossing, _vertices[static_cast<std::size_t>(prevIndex)], a,
-                                _vertices[static_cast<std::size_t>(curIndex)], b);
-                    placeOnPlane(crossing._pixCoord, bit);
-                    _vertices.push_back(crossing);
-                    _scratch.push_back(static_cast<int>(_vertices.size() - 1));
-                }
+                Vertex crossing{};
+                rsMixVertex(crossing, _vertices[static_cast<std::size_t>(prevIndex)], a,
+                            _vertices[static_cast<std::size_t>(curIndex)], b);
+                placeOnPlane(crossing._pixCoord, bit);
+                _vertices.push_back(crossing);
+                _scratch.push_back(static_cast<int>(_vertices.size() - 1));
             }
             if (cur >= 0.0) _scratch.push_back(curIndex);
             prevIndex = curIndex;
