@@ -38,38 +38,27 @@ public:
         return true;
     }
 
-    std::atomic<int> lockImpls{0}, unlockImpls{0}, violations{0}, holders{0};
+    std::atomic<int> lockImpls{0}, unlockImpls{0}, violations{0}, holders{0}, inside{0};
     std::atomic<bool> resident{false};
     bool failNextLock = false;
 
 protected:
-    void lockMemoryImpl() override {
-        enter();
-        if (failNextLock) {
-            failNextLock = false;
-            _inside.fetch_sub(1);
-            throw ExBase("probe", 1, "texture memory unavailable");
-        }
-        if (resident || holders != 0) ++violations;
-        std::this_thread::yield();  // widens the window in which a racing caller could slip in
-        resident = true;
-        ++lockImpls;
-        _inside.fetch_sub(1);
-    }
-    void unlockMemoryImpl() override {
-        enter();
-        if (!resident || holders != 0) ++violations;
-        std::this_thread::yield();
-        resident = false;
-        ++unlockImpls;
-        _inside.fetch_sub(1);
-    }
+    void lockMemoryImpl() override { hook(true); }
+    void unlockMemoryImpl() override { hook(false); }
 
 private:
-    void enter() {
-        if (_inside.fetch_add(1) != 0) ++violations;
+    void hook(bool locking) {
+        violations += inside.fetch_add(1) != 0 || holders != 0 || resident == locking;
+        if (locking && failNextLock) {
+            failNextLock = false;
+            --inside;
+            throw ExBase("probe", 1, "texture memory unavailable");
+        }
+        std::this_thread::yield();  // widens the window in which a racing caller could slip in
+        resident = locking;
+        ++(locking ? lockImpls : unlockImpls);
+        --inside;
     }
-    std::atomic<int> _inside{0};
 };
 
 // A random walk of locks and unlocks against a counting model: the hooks run on the first lock

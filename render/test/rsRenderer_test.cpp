@@ -90,68 +90,57 @@ TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
 // the box's seams, across the many regions of a big picture and where faces run past the sides -
 // except where the exit point lies nearer than the near limit or beyond the far plane.
 TEST(RsRenderer, ClosedMeshAroundTheEyeSumsToExactlyOneInAddMode) {
-    std::mt19937 rng(8);
-    std::uniform_real_distribution<double> unit(-1.0, 1.0);
-    const GeRectangle<int> rect{-150, 170, -90, 150};  // 76800 pixels: many regions
-    // Four corners and the outward normal per face, so that the faces are flat and wound outwards.
+    // The box [-1, 1]^3: four corners and the outward normal per face, wound outwards.
     std::vector<GePoint3<float>> corners;
     std::vector<GeVector3<float>> normals;
     std::vector<std::uint32_t> triangles;
     for (int axis = 0; axis < 3; ++axis)
         for (const float sign : {-1.0f, 1.0f}) {
-            const std::uint32_t v = static_cast<std::uint32_t>(corners.size());
+            const std::uint32_t v = static_cast<std::uint32_t>(corners.size()), p = sign > 0 ? 1 : 3, r = sign > 0 ? 3 : 2;
             for (int k = 0; k < 4; ++k) {
-                float c[3];
-                c[axis] = sign;
-                c[(axis + 1) % 3] = k & 1 ? 1.0f : -1.0f;
-                c[(axis + 2) % 3] = k & 2 ? 1.0f : -1.0f;
+                float c[3] = {0, 0, 0};
+                c[axis] = sign, c[(axis + 1) % 3] = k & 1 ? 1.0f : -1.0f, c[(axis + 2) % 3] = k & 2 ? 1.0f : -1.0f;
                 corners.emplace_back(c[0], c[1], c[2]);
-                normals.emplace_back(axis == 0 ? sign : 0.0f, axis == 1 ? sign : 0.0f, axis == 2 ? sign : 0.0f);
+                c[(axis + 1) % 3] = c[(axis + 2) % 3] = 0;
+                normals.emplace_back(c[0], c[1], c[2]);
             }
-            triangles.insert(triangles.end(), {v, sign > 0 ? v + 1 : v + 3, sign > 0 ? v + 3 : v + 1,
-                                               v, sign > 0 ? v + 3 : v + 2, sign > 0 ? v + 2 : v + 3});
+            triangles.insert(triangles.end(), {v, v + p, v + 4 - p, v, v + r, v + 5 - r});
         }
     SdMeshBuilder builder;
     builder.setVertices(corners).setTriangles(triangles).setNormals(normals);
     const RCShdPtr<const SdMesh> box = builder.build();
+    const GeRectangle<int> rect{-150, 170, -90, 150};  // 76800 pixels: many regions
+    std::mt19937 rng(8);
+    std::uniform_real_distribution<float> unit(-1.0f, 1.0f);
     int clipped = 0;
     for (int trial = 0; trial < 4; ++trial) {
         // In two trials the far plane cuts the box as well.
         const GeProjectiveMatrix3<double> projection = perspective(1.2, 0.5, trial < 2 ? 50.0 : 2.5);
-        // Seen from inside every face is a back face, drawn with its normal turned to the eye: a
-        // fragment counts only when it is.
+        // A fragment counts only when its normal, turned to the eye on a back face, faces it.
         MaterialSettings settings = counting(trial % 2 ? 0x03u : 0x41u);
         settings.probe = [](const RsShadingContext& c) {
             return c._normal.dot(GeVector3<float>(c._eyeCoord.x, c._eyeCoord.y, c._eyeCoord.z)) < 0.0f ? Rgba(1, 1, 1, 1) : Rgba(0, 0, 0, 1);
         };
-        // Local to camera: scale by 2, turn about z (roll) and y (yaw), then move so that the eye
-        // sits at local point e: near the back wall, with the box ahead, and so close to the side
-        // wall x = -1 that rays turned towards it meet it within the near limit.
-        const double roll = 3.0 * unit(rng), yaw = 0.3 * unit(rng);
+        // Local to camera: scaled by 2, turned about z (roll) and y (yaw), moved so that the eye sits
+        // at local point e, near the back wall with the box ahead and so close to the wall x = -1
+        // that rays turned towards it meet it within the near limit.
+        GeAffineMatrix3<float> m = GeAffineMatrix3<float>::makeRotation({0, 0, 1}, 3.0f * unit(rng)) *
+                                   GeAffineMatrix3<float>::makeRotation({0, 1, 0}, 0.3f * unit(rng)) * GeAffineMatrix3<float>::makeScale(2, 2, 2);
         const double e[3] = {-0.93 + 0.02 * trial, 0.8 * unit(rng), 0.85};
-        double m[3][3] = {{std::cos(roll) * std::cos(yaw), -std::sin(roll), std::cos(roll) * std::sin(yaw)},
-                          {std::sin(roll) * std::cos(yaw), std::cos(roll), std::sin(roll) * std::sin(yaw)},
-                          {-std::sin(yaw), 0.0, std::cos(yaw)}};
-        double t[3];
-        for (int r = 0; r < 3; ++r) {
-            for (int c = 0; c < 3; ++c) m[r][c] *= 2.0;
-            t[r] = -(m[r][0] * e[0] + m[r][1] * e[1] + m[r][2] * e[2]);
-        }
-        const GeAffineMatrix3<float> toCamera{float(m[0][0]), float(m[0][1]), float(m[0][2]), float(t[0]),
-                                              float(m[1][0]), float(m[1][1]), float(m[1][2]), float(t[1]),
-                                              float(m[2][0]), float(m[2][1]), float(m[2][2]), float(t[2])};
-        const RCShdPtr<RsGeomInstance> instance = drawn(box, settings, toCamera);
+        const GePoint3<float> eye = m.transformPoint(GePoint3<float>(float(e[0]), float(e[1]), float(e[2])));
+        m.setTranslation({-eye.x, -eye.y, -eye.z});
+        const RCShdPtr<RsGeomInstance> instance = drawn(box, settings, m);
         instance->_drawFrontFaces = false;
         Picture picture(rect);
         render(makeScene({instance}), projection, rect, picture);
         for (int y = rect.y0; y < rect.y1; ++y)
             for (int x = rect.x0; x < rect.x1; ++x) {
-                // The ray through the pixel centre, in the box's frame (m is a scaled rotation, so
-                // its inverse is its transpose over 4), leaves the box at tExit.
+                // The ray through the pixel centre, in the box's frame (m is a scaled rotation: its
+                // inverse is its transpose over 4), leaves the box at tExit.
                 const double d[3] = {(x + 0.5 - 10.0) / 160.0 / projection(0, 0), (y + 0.5 - 30.0) / 120.0 / projection(1, 1), -1.0};
                 double tExit = 1e300;
                 for (int axis = 0; axis < 3; ++axis) {
-                    const double dl = (m[0][axis] * d[0] + m[1][axis] * d[1] + m[2][axis] * d[2]) / 4.0;
+                    const double dl = (m(0, axis) * d[0] + m(1, axis) * d[1] + m(2, axis) * d[2]) / 4.0;
                     if (dl != 0.0) tExit = std::min(tExit, ((dl > 0 ? 1.0 : -1.0) - e[axis]) / dl);
                 }
                 const double pixelZ = 0.5 * (projection(2, 2) * -tExit + projection(2, 3)) / tExit + 0.5;
