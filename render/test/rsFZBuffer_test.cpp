@@ -1,7 +1,6 @@
 // The fragment Z-buffer: per-pixel lists in both modes against a model that states what a list
-// must hold without building it; the pool's growth in its memory account; triangles drawn through
-// its three rasterizers and resolved against the layered composite; and what a factory hands the
-// buffers it makes.
+// must hold without building it; the pool's growth in its memory account; and what a factory hands
+// the buffers it makes.
 //
 // Hand-made spans tell the material which fragment it shades through the eye position, which runs
 // (x, id, 0) along the span (x the region-relative pixel, id the span's number); the depth starts
@@ -163,84 +162,6 @@ TEST(RsFZBuffer, MemoryAccountGrowsByWholeChunks) {
         EXPECT_EQ(buffer.getPool().getChunkCount(), 3u);
         EXPECT_EQ(buffer.getMemorySize(), sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel + 20 * sizeof(RsFragment));
     }
-}
-
-template <class Vertex>
-Vertex vertexAt(double x, double y, double z) {
-    Vertex v{};
-    v._pixCoord = GeHomogeneousCoord3<double>(x, y, z, 1.0);
-    v._w = 1.0;
-    if constexpr (requires { v._normal; }) v._normal = GePoint3<double>(0.0, 0.0, 1.0);
-    if constexpr (requires { v._tangent; }) v._tangent = GePoint3<double>(1.0, 0.0, 0.0), v._binormal = GePoint3<double>(0.0, 1.0, 0.0);
-    return v;
-}
-
-// A rectangle of pixels at one depth, as two triangles whose edges lie on pixel borders.
-struct Quad {
-    GeRectangle<int> pixels;
-    double depth;
-    Rgba colour;  // straight
-};
-
-template <class Vertex>
-void drawQuad(const RsFZBuffer& buffer, const RsDrawContext& context, const Quad& q) {
-    const auto& rasterizer = buffer.getRasterizer<Vertex>();
-    const Vertex a = vertexAt<Vertex>(q.pixels.x0, q.pixels.y0, q.depth), b = vertexAt<Vertex>(q.pixels.x1, q.pixels.y0, q.depth);
-    const Vertex c = vertexAt<Vertex>(q.pixels.x1, q.pixels.y1, q.depth), d = vertexAt<Vertex>(q.pixels.x0, q.pixels.y1, q.depth);
-    rasterizer.rasterizeTriangle(context, a, b, c);
-    rasterizer.rasterizeTriangle(context, a, c, d);
-}
-
-// Three overlapping quads, one per vertex kind and so per rasterizer, in a region away from the
-// origin, resolved into a larger tile. With Z the drawing order does not matter; without Z far to
-// near lets each opaque quad hide what is drawn after it.
-TEST(RsFZBuffer, TrianglesThroughAllRasterizersResolveToTheLayeredComposite) {
-    const GeRectangle<int> region{100, 120, 50, 66};
-    const Quad quads[] = {{{102, 110, 52, 60}, 0.5, Rgba(1.0f, 0.0f, 0.0f, 1.0f)},
-                          {{106, 114, 56, 64}, 0.3, Rgba(0.0f, 1.0f, 0.0f, 0.5f)},
-                          {{100, 108, 50, 58}, 0.7, Rgba(0.0f, 0.2f, 1.0f, 1.0f)}};
-    const Rgba fill(0.1f, 0.2f, 0.3f, 1.0f);
-    for (bool zBuffer : {true, false})
-        for (const std::vector<int>& order : {std::vector<int>{1, 0, 2}, std::vector<int>{2, 0, 1}}) {
-            RsFZBuffer buffer(region.x0, region.y0, region.getWidth(), region.getHeight(), zBuffer, true);
-            const IxWriteGuard output = makeTile({4, 32}, {95, 125, 45, 70});
-            buffer.setOutput(output, IxReadGuard(), fill, false, 1.0f);
-            for (int i : order) {
-                TestMaterial material(MaterialSettings(quads[i].colour));
-                const RsDrawContext context = makeContext(material, RsTransferFunc::getFunction(Mode::normal), true);
-                if (i == 0) drawQuad<RsPlainVertex>(buffer, context, quads[i]);
-                if (i == 1) drawQuad<RsNormalVertex>(buffer, context, quads[i]);
-                if (i == 2) drawQuad<RsTangentVertex>(buffer, context, quads[i]);
-            }
-            buffer.finalize();
-            for (int y = 45; y < 70; ++y)
-                for (int x = 95; x < 125; ++x) {
-                    if (!region.contains(x, y)) {
-                        ASSERT_EQ(pixelColour(output, x, y), Rgba(0, 0, 0, 0)) << x << "," << y;
-                        continue;
-                    }
-                    // Without Z: the covering quads in drawing order up to the first opaque one, the
-                    // last drawn farthest. With Z: from far to near, from the nearest opaque one on.
-                    std::vector<const Quad*> covering;
-                    for (int i : order)
-                        if (quads[i].pixels.contains(x, y)) covering.push_back(&quads[i]);
-                    std::vector<Rgba> layers;
-                    if (!zBuffer) {
-                        for (const Quad* q : covering)
-                            if (layers.insert(layers.begin(), q->colour); q->colour.a == 1.0f) break;
-                    } else {
-                        std::sort(covering.begin(), covering.end(), [](const Quad* a, const Quad* b) { return a->depth > b->depth; });
-                        for (const Quad* q : covering) {
-                            if (q->colour.a == 1.0f) layers.clear();
-                            layers.push_back(q->colour);
-                        }
-                    }
-                    int length = 0;
-                    for (const RsFragment* f = buffer.getLists()[(y - 50) * 20 + (x - 100)]; f; f = f->_next) ++length;
-                    EXPECT_EQ(length, int(layers.size())) << x << "," << y;
-                    expectNearRgba(pixelColour(output, x, y), overComposite(fill, layers), 1e-6, "Z " + std::to_string(zBuffer));
-                }
-        }
 }
 
 // A factory's buffers cover the region asked for in the factory's depth mode, and resolve with

@@ -1,66 +1,14 @@
-// The planes of the pixel data: gradients of linear attributes, the depth slope, and the rules for
-// triangles without area on the screen.
+// The planes of the pixel data: the depth slope, and the rules for triangles without area on the
+// screen (the rasterizer tests read the planes of the others at every pixel).
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <random>
 #include <vector>
 
 #include "rsPixelData.h"
 
 namespace Zr {
 namespace {
-
-RsPlainVertex plainAt(double x, double y, double q) {
-    RsPlainVertex v;
-    v._pixCoord = GeHomogeneousCoord3<double>(x, y, q, 1.0);
-    v._w = q;
-    v._eyeCoord = GePoint3<double>(q, 2 * q, -q);
-    v._texCoord = GePoint3<double>(q, -3 * q, 1e9);  // the third component is not interpolated
-    return v;
-}
-
-// Every field of a triangle whose attributes are a linear function of the screen recovers that
-// function: gradients, value at the region origin, value at a placed pixel's centre.
-TEST(RsPixelData, PlanesOfLinearAttributesAreThoseAttributes) {
-    std::mt19937 rng(17);
-    std::uniform_real_distribution<double> coord(-50, 150), coef(-2, 2);
-    for (int n = 0; n < 200; ++n) {
-        const double a = coef(rng), b = coef(rng), c = coef(rng) * 10;
-        auto f = [&](double x, double y) { return a * x + b * y + c; };
-        double x[3], y[3];
-        for (int i = 0; i < 3; ++i) {
-            x[i] = coord(rng);
-            y[i] = coord(rng);
-        }
-        const double area = (x[1] - x[0]) * (y[2] - y[0]) - (x[2] - x[0]) * (y[1] - y[0]);
-        if (std::abs(area) < 1.0) continue;
-        const int originX = 20, originY = -10;
-        const RsPixelData<RsPlainVertex> d(GePoint2<double>(x[0] - originX, y[0] - originY),
-                                           plainAt(x[0], y[0], f(x[0], y[0])),
-                                           plainAt(x[1], y[1], f(x[1], y[1])),
-                                           plainAt(x[2], y[2], f(x[2], y[2])));
-        const double tol = 1e-10 * (1 + std::abs(c) + 300 * (std::abs(a) + std::abs(b)));
-        EXPECT_NEAR(d._w._dq_dx, a, tol);
-        EXPECT_NEAR(d._w._dq_dy, b, tol);
-        EXPECT_NEAR(d._w._q00, f(originX, originY), tol);
-        EXPECT_NEAR(d._z._dq_dx, a, tol);
-        EXPECT_NEAR(d._texCoord._dq_dy.x, b, tol);
-        EXPECT_NEAR(d._texCoord._dq_dx.y, -3 * a, 3 * tol);
-        EXPECT_NEAR(d._eyeCoord._dq_dy.y, 2 * b, 1e-4 * (1 + std::abs(b)));
-        EXPECT_EQ(d._w._q, 0.0);
-
-        RsPixelData<RsPlainVertex> placed = d;
-        placed.place(7, 3);
-        const double cx = originX + 7.5, cy = originY + 3.5;
-        EXPECT_NEAR(placed._w._q, f(cx, cy), tol);
-        EXPECT_NEAR(placed._texCoord._q.y, -3 * f(cx, cy), 3 * tol);
-        EXPECT_NEAR(placed._eyeCoord._q.z, -f(cx, cy), 1e-3);
-        placed.stepX();
-        EXPECT_NEAR(placed._w._q, f(cx + 1, cy), tol);
-        EXPECT_NEAR(placed._eyeCoord._q.x, f(cx + 1, cy), 1e-3);
-    }
-}
 
 // The depth plane keeps half the depth it gains across a pixel's diagonal; w has no slope.
 TEST(RsPixelData, DepthSlopeIsHalfTheChangeAcrossTheDiagonal) {

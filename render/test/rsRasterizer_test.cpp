@@ -1,5 +1,5 @@
 // The rasterizer: which samples it covers against the exact fill rule, triangle by triangle and
-// over meshes whose triangles share edges, at whole-pixel and both sub-pixel grains; the pixel
+// over fans whose triangles share edges, at whole-pixel and both sub-pixel grains; the pixel
 // data that reaches the buffer; the spans of sub-pixel rows; and the interrupt check once per
 // scanline, after which a cancel leaves the rasterizer as good as new.
 #include <gtest/gtest.h>
@@ -47,31 +47,23 @@ protected:
         return {13, 13 + (samplesX >> kXBits), -7, -7 + (samplesY >> kYBits)};
     }
 
-    // Compares what one triangle covered with the reference, sample by sample. Where the
-    // arithmetic is exact no difference is allowed; otherwise a difference must lie within the
-    // rounding bound of an edge. Returns the number of such differences.
-    static int expectMatchesReference(H& h, Pt a, Pt b, Pt c, bool exact) {
+    // Compares what one triangle covered with the exact reference, sample by sample.
+    static void expectMatchesReference(H& h, Pt a, Pt b, Pt c) {
         h._buffer.clear();
         h.draw(a, b, c);
         const ReferenceTriangle ref = h.reference(a, b, c);
-        const double bound = exact ? 0.0 : ref.roundingBound(H::kEpsilon);
         EXPECT_EQ(h._buffer._errors, 0);
         long inBox = 0;
-        int misses = 0;
         for (i64 sy = std::max<i64>(ref.rowBegin() - 2, 0); sy < std::min<i64>(ref.rowEnd() + 2, h._buffer._samplesY); ++sy)
-            for (i64 sx = std::max<i64>(ref.colBegin() - 2, 0); sx < std::min<i64>(ref.colEnd() + 2, h._buffer._samplesX); ++sx) {
+            for (i64 sx = std::max<i64>(ref.colBegin() - 2, 0); sx < std::min<i64>(ref.colEnd() + 2, h._buffer._samplesX);
+                 ++sx) {
                 const int got = h._buffer.count(int(sx), int(sy));
                 inBox += got;
-                if (got == (ref.covers(sx, sy) ? 1 : 0)) continue;
-                EXPECT_LE(got, 1) << "sample covered twice at " << sx << ", " << sy;
-                EXPECT_FALSE(exact) << "sample " << sx << ", " << sy << " got " << got << " for triangle (" << a.x << ","
-                                    << a.y << ") (" << b.x << "," << b.y << ") (" << c.x << "," << c.y << ") /256";
-                EXPECT_LT(ref.horizontalDistance(sx, sy), bound) << "sample " << sx << ", " << sy << " far from every edge";
-                if (::testing::Test::HasFailure()) return misses;
-                ++misses;
+                ASSERT_EQ(got, ref.covers(sx, sy) ? 1 : 0)
+                    << "sample " << sx << ", " << sy << " of triangle (" << a.x << "," << a.y << ") (" << b.x << ","
+                    << b.y << ") (" << c.x << "," << c.y << ") /256";
             }
         EXPECT_EQ(inBox, h._buffer._hits) << "samples covered outside the triangle's box";
-        return misses;
     }
 
     // Checks a mesh drawn into h against its outline: every sample inside covered exactly once
@@ -143,68 +135,13 @@ TYPED_TEST(RsRasterizer, ExactInputsFollowTheFillRuleExactly) {
         std::shuffle(ys.begin(), ys.end(), rng);
         std::array<Pt, 3> p;
         for (int i = 0; i < 3; ++i) p[i] = {region.x0 * u + quarter * column(rng), ys[i]};
-        this->expectMatchesReference(h, p[0], p[1], p[2], true);
+        this->expectMatchesReference(h, p[0], p[1], p[2]);
     }
 }
 
-// Triangles anywhere on the 1/256 grid, from slivers and specks to the whole region, corners often
-// on sample centres: a difference from the exact rule is a rounding of an edge, within the bound
-// of the float (whole pixels) or double (sub-pixels) walk, and rare.
-TYPED_TEST(RsRasterizer, GeneralInputsFollowTheFillRuleUpToRounding) {
-    const GeRectangle<int> region = TestFixture::region(96, 64);
-    typename TestFixture::H h(region, 64, 64);
-    std::mt19937 rng(99);
-    const double toX = 1.0 / (1 << TestFixture::kXBits), toY = 1.0 / (1 << TestFixture::kYBits);
-    int misses = 0;
-    for (int n = 0; n < 300 && !::testing::Test::HasFailure(); ++n) {
-        std::array<Pt, 3> p;
-        const int kind = rng() % 4;
-        if (kind == 0) {
-            for (Pt& q : p) q = {randomCoord(rng, region.x0, region.x1), randomCoord(rng, region.y0, region.y1)};
-        } else {
-            // Sizes in samples of the grain, so that each grain sees specks and large triangles.
-            const double sx = (kind == 1 ? 0.3 : kind == 2 ? 3.0 : 20.0) * toX, sy = sx / toX * toY;
-            const Pt c{randomCoord(rng, region.x0 + sx, region.x1 - sx), randomCoord(rng, region.y0 + sy, region.y1 - sy)};
-            for (Pt& q : p) q = {c.x + randomCoord(rng, -sx, sx), c.y + randomCoord(rng, -sy, sy)};
-        }
-        for (Pt& q : p) {
-            if (rng() % 3 == 0) q.x = snapToSample(q.x, TestFixture::kXBits);
-            if (rng() % 3 == 0) q.y = snapToSample(q.y, TestFixture::kYBits);
-            q.x = std::clamp<i64>(q.x, region.x0 * u, region.x1 * u - 1);
-            q.y = std::clamp<i64>(q.y, region.y0 * u, region.y1 * u - 1);
-        }
-        misses += this->expectMatchesReference(h, p[0], p[1], p[2], false);
-    }
-    EXPECT_LT(misses, 50);
-}
-
-// Zero-area triangles draw nothing and deliver no span: one row, all y within one sample row, and
-// collinear corners in every direction, in three vertex orders.
-TYPED_TEST(RsRasterizer, DegenerateTrianglesDrawNothing) {
-    const GeRectangle<int> region = TestFixture::region(64, 48);
-    typename TestFixture::H h(region, 8, 8);
-    const i64 ox = region.x0 * u, oy = region.y0 * u, cell = u >> TestFixture::kYBits;
-    const std::array<Pt, 3> cases[] = {
-        {Pt{ox + u, oy + 2 * u}, Pt{ox + 5 * u, oy + 2 * u}, Pt{ox + 3 * u, oy + 2 * u}},
-        {Pt{ox + u, oy + cell / 2 + 1}, Pt{ox + 9 * u, oy + cell / 2 + 3}, Pt{ox + 4 * u, oy + cell / 2 + cell}},
-        {Pt{ox + u, oy + u}, Pt{ox + 3 * u, oy + 5 * u}, Pt{ox + 5 * u, oy + 9 * u}},
-        {Pt{ox + 9 * u, oy + u}, Pt{ox + 5 * u, oy + 5 * u}, Pt{ox + u, oy + 9 * u}},
-        {Pt{ox + 3 * u, oy + u}, Pt{ox + 3 * u, oy + 9 * u}, Pt{ox + 3 * u, oy + 4 * u}},
-        {Pt{ox + 3 * u, oy + 3 * u}, Pt{ox + 3 * u, oy + 3 * u}, Pt{ox + 3 * u, oy + 3 * u}},
-    };
-    h._buffer._keepDeliveries = true;
-    for (const auto& c : cases) {
-        h.draw(c[0], c[1], c[2]);
-        h.draw(c[2], c[0], c[1]);
-        h.draw(c[1], c[0], c[2]);
-    }
-    EXPECT_TRUE(h._buffer._deliveries.empty());
-    EXPECT_EQ(h._buffer._hits, 0);
-}
-
-// Fans around a centre and perturbed grids of quads, whose triangles share edges, drawn in random
-// vertex orders into regions cut into blocks and tiles of many sizes: watertight.
-TYPED_TEST(RsRasterizer, MeshesAreWatertight) {
+// Fans of triangles around a centre, sharing their edges, specks to large, drawn in random vertex
+// orders into regions cut into blocks and tiles of many sizes: watertight.
+TYPED_TEST(RsRasterizer, FansAreWatertight) {
     using H = typename TestFixture::H;
     std::mt19937 rng(42);
     const double sx = 1.0 / (1 << TestFixture::kXBits), sy = 1.0 / (1 << TestFixture::kYBits);
@@ -239,46 +176,7 @@ TYPED_TEST(RsRasterizer, MeshesAreWatertight) {
             inside += this->expectCoversOutlineOnce(h, outline);
             if (::testing::Test::HasFailure()) return;
         }
-    // Grids: cells across and down, cell size in samples, region size in samples.
-    const std::array<double, 4> grids[] = {{12, 10, 0.7, 64}, {9, 7, 6.5, 96}, {3, 2, 44, 160}};
-    for (const auto& [cellsX, cellsY, cell, samples] : grids)
-        for (int rep = 0; rep < 4; ++rep) {
-            const GeRectangle<int> region = TestFixture::region(int(samples), int(samples));
-            H h(region, 2 + rep * 9, 3 + rep * 4);
-            const double hx = cell * sx, hy = cell * sy;
-            // Far enough inside that the perturbed border stays in the region. Snapping moves a
-            // vertex by up to half a sample: only on cells large enough not to fold, with less
-            // perturbation.
-            const Pt origin{randomCoord(rng, region.x0 + 0.25 * hx + sx, region.x0 + 0.25 * hx + 2 * sx),
-                            randomCoord(rng, region.y0 + 0.25 * hy + sy, region.y0 + 0.25 * hy + 2 * sy)};
-            const bool snap = rep % 2 == 1 && cell > 6;
-            const double jitter = snap ? 0.15 : 0.2;
-            const int nx = int(cellsX), ny = int(cellsY);
-            std::vector<Pt> grid;
-            for (int j = 0; j <= ny; ++j)
-                for (int i = 0; i <= nx; ++i) {
-                    Pt p{origin.x + i64(i * hx * u) + randomCoord(rng, -jitter * hx, jitter * hx),
-                         origin.y + i64(j * hy * u) + randomCoord(rng, -jitter * hy, jitter * hy)};
-                    if (snap && (i + j) % 2 == 0) p = {snapToSample(p.x, TestFixture::kXBits), snapToSample(p.y, TestFixture::kYBits)};
-                    grid.push_back(p);
-                }
-            auto at = [&](int i, int j) { return grid[std::size_t(j * (nx + 1) + i)]; };
-            for (int j = 0; j < ny; ++j)
-                for (int i = 0; i < nx; ++i) {
-                    const Pt a = at(i, j), b = at(i + 1, j), d = at(i, j + 1), e = at(i + 1, j + 1);
-                    const bool diagonal = rng() % 2;
-                    this->drawShuffled(h, rng, a, b, diagonal ? e : d);
-                    this->drawShuffled(h, rng, diagonal ? a : b, e, d);
-                }
-            std::vector<Pt> outline;
-            for (int i = 0; i < nx; ++i) outline.push_back(at(i, 0));
-            for (int j = 0; j < ny; ++j) outline.push_back(at(nx, j));
-            for (int i = nx; i > 0; --i) outline.push_back(at(i, ny));
-            for (int j = ny; j > 0; --j) outline.push_back(at(0, j));
-            inside += this->expectCoversOutlineOnce(h, outline);
-            if (::testing::Test::HasFailure()) return;
-        }
-    EXPECT_GT(inside, 20000);
+    EXPECT_GT(inside, 10000);
 }
 
 // The interrupt check runs once per row (sub-row) from the exact ceiling of the top to that of the

@@ -387,37 +387,11 @@ public:
         return true;
     }
 
-    // Horizontal distance, in samples, from the sample to the nearest edge line that is not
-    // horizontal.
-    double horizontalDistance(i64 sx, i64 sy) const {
-        double best = 1e300;
-        const Pt p{sx * kWalkUnit, sy * kWalkUnit};
-        for (int i = 0; i < 3; ++i) {
-            const Pt& a = _v[i];
-            const Pt& b = _v[(i + 1) % 3];
-            if (a.y != b.y)
-                best = std::min(best, std::abs(double(edge(a, b, p))) / std::abs(double(b.y - a.y)) / kWalkUnit);
-        }
-        return best;
-    }
-
     // The sample rows and columns that can be covered: [rowBegin, rowEnd) x [colBegin, colEnd).
     i64 rowBegin() const { return ceilDiv(std::min({_v[0].y, _v[1].y, _v[2].y}), kWalkUnit); }
     i64 rowEnd() const { return ceilDiv(std::max({_v[0].y, _v[1].y, _v[2].y}), kWalkUnit); }
     i64 colBegin() const { return ceilDiv(std::min({_v[0].x, _v[1].x, _v[2].x}), kWalkUnit); }
     i64 colEnd() const { return ceilDiv(std::max({_v[0].x, _v[1].x, _v[2].x}), kWalkUnit) + 1; }
-
-    // A bound, in samples, on how far walked edges of relative rounding epsilon may stray.
-    double roundingBound(double epsilon) const {
-        double maxX = 0, maxSlope = 0;
-        for (int i = 0; i < 3; ++i) {
-            const Pt& a = _v[i];
-            const Pt& b = _v[(i + 1) % 3];
-            maxX = std::max(maxX, std::abs(double(a.x)) / kWalkUnit);
-            if (a.y != b.y) maxSlope = std::max(maxSlope, std::abs(double(b.x - a.x) / double(b.y - a.y)));
-        }
-        return (double(rowEnd() - rowBegin()) + 2.0) * (maxX + maxSlope + 1.0) * epsilon * 4.0;
-    }
 
 private:
     static i64 edge(const Pt& a, const Pt& b, const Pt& p) { return (b.x - a.x) * (p.y - a.y) - (b.y - a.y) * (p.x - a.x); }
@@ -518,8 +492,6 @@ public:
     static constexpr int kXBits = PixelSpan::kSubPixelBits;
     static constexpr int kYBits = PixelSpan::kSubScanlineBits;
     static constexpr bool kSubPixel = kXBits != 0;
-    // Relative rounding of the edge walk: float for whole pixels, double for sub-pixels.
-    static constexpr double kEpsilon = kSubPixel ? 0x1p-52 : 0x1p-23;
 
     // Spans whose rows are not delivered at their place (8 x 4 cells) can only be put back by the
     // buffer when a triangle arrives in one block: they get a block of 4096 rows.
