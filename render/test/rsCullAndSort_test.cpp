@@ -79,24 +79,6 @@ Verdict bruteForce(const GeProjectiveMatrix3<double>& projection, const GeAligne
     return verdict;
 }
 
-// The camera box holds the object corners taken through the placement and the view in double,
-// and touches the outermost of them on every side.
-void expectTightCameraBox(const RsGeomInstance& instance, const GeAffineMatrix3<float>& worldToView,
-                          const GeAlignedBox3<float>& objectBox) {
-    double lo[3] = {1e300, 1e300, 1e300}, hi[3] = {-1e300, -1e300, -1e300};
-    for (int c = 0; c < 8; ++c) {
-        const GePoint3<double> p = applyInDouble(worldToView, applyInDouble(instance._matrix, cornerOf(objectBox, c)));
-        const double v[3] = {p.x, p.y, p.z};
-        for (int a = 0; a < 3; ++a) lo[a] = std::min(lo[a], v[a]), hi[a] = std::max(hi[a], v[a]);
-    }
-    const GeAlignedBox3<float>& box = instance._cameraBox;
-    const double got[6] = {box.xMin, box.yMin, box.zMin, box.xMax, box.yMax, box.zMax};
-    for (int a = 0; a < 3; ++a) {
-        EXPECT_NEAR(got[a], lo[a], 1e-3);
-        EXPECT_NEAR(got[a + 3], hi[a], 1e-3);
-    }
-}
-
 // The reference order: the survivors in scene order, reversed so that a stable sort puts the later
 // of two equal keys first, then stably sorted by render order (camera only) and nearer middle.
 std::vector<RsGeomInstance*> referenceOrder(std::vector<RsGeomInstance*> survivors, bool byRenderOrder) {
@@ -144,7 +126,10 @@ TEST(RsCullAndSort, SelectionMatchesBruteForceOnRandomScenes) {
             RsGeomInstance& instance = *instances[i];
             if (!(casters ? instance._castsShadows : instance._visible)) continue;
             EXPECT_EQ(instance._toCamera, worldToView * instance._matrix);
-            expectTightCameraBox(instance, worldToView, boxes[i]);
+            // The camera box holds the object corners through the placement and the view, tightly.
+            double lo[3] = {1e300, 1e300, 1e300}, hi[3] = {-1e300, -1e300, -1e300};
+            growBoxInDouble({worldToView, instance._matrix}, boxes[i], lo, hi);
+            expectBoxNear(instance._cameraBox, lo, hi, 1e-3);
             const Verdict verdict = bruteForce(projection, instance._cameraBox);
             if (!verdict.outside) survivors.push_back(&instance);
             anyUnsure |= verdict.unsure;

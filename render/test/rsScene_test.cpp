@@ -39,24 +39,6 @@ GeAlignedBox3<float> randomBox(std::mt19937& rng) {
     return GeAlignedBox3<float>({cx - hx, cy - hy, cz - hz}, {cx + hx, cy + hy, cz + hz});
 }
 
-// The world box of an object box through m, from the eight corners in double, as (min, max) per
-// axis, widened by `into`.
-void growWorldBox(const GeAffineMatrix3<float>& m, const GeAlignedBox3<float>& objectBox, double lo[3], double hi[3]) {
-    for (int c = 0; c < 8; ++c) {
-        const GePoint3<double> p = applyInDouble(m, cornerOf(objectBox, c));
-        const double v[3] = {p.x, p.y, p.z};
-        for (int a = 0; a < 3; ++a) lo[a] = std::min(lo[a], v[a]), hi[a] = std::max(hi[a], v[a]);
-    }
-}
-
-void expectBoxNear(const GeAlignedBox3<float>& box, const double lo[3], const double hi[3], double tolerance) {
-    const float got[6] = {box.xMin, box.yMin, box.zMin, box.xMax, box.yMax, box.zMax};
-    for (int a = 0; a < 3; ++a) {
-        EXPECT_NEAR(got[a], lo[a], tolerance);
-        EXPECT_NEAR(got[a + 3], hi[a], tolerance);
-    }
-}
-
 TEST(RsGeomInstance, KeepsItsAttributesAndLightSet) {
     const auto mesh = makeBoxMesh({0, 0, 0}, {1, 1, 1});
     for (int bits = 0; bits < 32; ++bits) {
@@ -81,7 +63,7 @@ TEST(RsGeomInstance, WorldBoxHoldsTheTransformedCornersTightly) {
         const GeAlignedBox3<float> objectBox = randomBox(rng);
         const GeAffineMatrix3<float> matrix = randomAffine(rng, 3.0f);
         double lo[3] = {1e300, 1e300, 1e300}, hi[3] = {-1e300, -1e300, -1e300};
-        growWorldBox(matrix, objectBox, lo, hi);
+        growBoxInDouble({matrix}, objectBox, lo, hi);
         expectBoxNear(makeInstance(makeBoxMesh(objectBox.getMin(), objectBox.getMax()), matrix)->getBoundingBox(), lo, hi, 1e-4);
     }
     EXPECT_THROW(makeInstance(RCShdPtr<const SdMesh>())->getBoundingBox(), ExNullPtr);
@@ -97,7 +79,7 @@ TEST(RsScene, BoundsAreTheUnionOfTheInstanceBoxes) {
             const GeAlignedBox3<float> objectBox = randomBox(rng);
             const GeAffineMatrix3<float> matrix = randomAffine(rng, 2.0f);
             instances.push_back(makeInstance(makeBoxMesh(objectBox.getMin(), objectBox.getMax()), matrix));
-            growWorldBox(matrix, objectBox, lo, hi);
+            growBoxInDouble({matrix}, objectBox, lo, hi);
         }
         const std::vector<RCShdPtr<RsGeomInstance>> given = instances;
         RsScene::LightList lights;

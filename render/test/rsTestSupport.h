@@ -6,7 +6,6 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <atomic>
 #include <bit>
 #include <cstring>
 #include <functional>
@@ -130,15 +129,32 @@ inline GeProjectiveMatrix3<double> perspective(double fov, double n, double f) {
     return {c, 0, 0, 0, 0, c, 0, 0, 0, 0, (f + n) / (n - f), 2 * f * n / (n - f), 0, 0, -1, 0};
 }
 
-// Corner c of box (bit 0 picks the x end, bit 1 y, bit 2 z) and p through m, in double.
+// Corner c of box (bit 0 picks the x end, bit 1 y, bit 2 z), in double.
 inline GePoint3<double> cornerOf(const GeAlignedBox3<float>& box, int c) {
     return {c & 1 ? box.xMax : box.xMin, c & 2 ? box.yMax : box.yMin, c & 4 ? box.zMax : box.zMin};
 }
-inline GePoint3<double> applyInDouble(const GeAffineMatrix3<float>& m, const GePoint3<double>& p) {
-    double out[3];
-    for (int row = 0; row < 3; ++row)
-        out[row] = double(m(row, 0)) * p.x + double(m(row, 1)) * p.y + double(m(row, 2)) * p.z + double(m(row, 3));
-    return {out[0], out[1], out[2]};
+
+// The box of the corners of box taken through the matrices (the last first) in double, as (min,
+// max) per axis, grown into lo and hi; and the check that a box is that one.
+inline void growBoxInDouble(std::vector<GeAffineMatrix3<float>> ms, const GeAlignedBox3<float>& box, double lo[3],
+                            double hi[3]) {
+    for (int c = 0; c < 8; ++c) {
+        GePoint3<double> p = cornerOf(box, c);
+        for (auto m = ms.rbegin(); m != ms.rend(); ++m) {
+            double v[3];
+            for (int r = 0; r < 3; ++r) v[r] = (*m)(r, 0) * p.x + (*m)(r, 1) * p.y + (*m)(r, 2) * p.z + double((*m)(r, 3));
+            p = {v[0], v[1], v[2]};
+        }
+        const double v[3] = {p.x, p.y, p.z};
+        for (int a = 0; a < 3; ++a) lo[a] = std::min(lo[a], v[a]), hi[a] = std::max(hi[a], v[a]);
+    }
+}
+inline void expectBoxNear(const GeAlignedBox3<float>& box, const double lo[3], const double hi[3], double tolerance) {
+    const float got[6] = {box.xMin, box.yMin, box.zMin, box.xMax, box.yMax, box.zMax};
+    for (int a = 0; a < 3; ++a) {
+        EXPECT_NEAR(got[a], lo[a], tolerance);
+        EXPECT_NEAR(got[a + 3], hi[a], tolerance);
+    }
 }
 
 // ---- Pictures and tiles --------------------------------------------------------------------------
@@ -264,16 +280,10 @@ inline void expectNearRgba(const Rgba& got, const Rgba& want, double tolerance, 
 
 // ---- Texture doubles -----------------------------------------------------------------------------
 
-// Answers every lookup with one colour; counts the shader lookups and keeps their arguments, and
-// counts tile releases and its own destruction in counters that may outlive it.
+// Answers every lookup with one colour, and keeps the count and arguments of the shader lookups.
 class ConstantSampler : public SdTextureSampler {
 public:
-    explicit ConstantSampler(const Rgba& colour, std::atomic<int>* releases = nullptr,
-                             std::atomic<int>* destructions = nullptr)
-        : _colour(colour), _releases(releases), _destructions(destructions) {}
-    ~ConstantSampler() override {
-        if (_destructions) ++*_destructions;
-    }
+    explicit ConstantSampler(const Rgba& colour) : _colour(colour) {}
     using SdTextureSampler::sample;
     Rgba sample(const GePoint2<double>&, double, double) const override { return _colour; }
     Rgba sample(int, int) const override { return _colour; }
@@ -284,17 +294,13 @@ public:
         return _colour;
     }
     void lockTiles() const override {}
-    void releaseTiles() const override {
-        if (_releases) ++*_releases;
-    }
+    void releaseTiles() const override {}
     mutable int _lookups = 0;
     mutable GePoint2<double> _lastTexCoord;
     mutable GeLinearMatrix2<double> _lastDerivatives;
 
 private:
     Rgba _colour;
-    std::atomic<int>* _releases;
-    std::atomic<int>* _destructions;
 };
 
 // A map of the given weight whose samplers are ConstantSamplers; with handOutNone it answers a
@@ -306,13 +312,8 @@ public:
         _weight = weight;
     }
     OPtr<SdTextureSampler> createSampler() const override {
-        if (_handOutNone) return OPtr<SdTextureSampler>();
-        ++_samplersMade;
-        return makeOwned<ConstantSampler>(_colour, &_releases, &_destructions);
+        return _handOutNone ? OPtr<SdTextureSampler>() : makeOwned<ConstantSampler>(_colour);
     }
-    mutable std::atomic<int> _samplersMade{0};
-    mutable std::atomic<int> _releases{0};
-    mutable std::atomic<int> _destructions{0};
 
 private:
     Rgba _colour;

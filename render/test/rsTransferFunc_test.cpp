@@ -10,8 +10,6 @@
 #include <cmath>
 #include <cstdint>
 #include <functional>
-#include <sstream>
-#include <string>
 #include <vector>
 
 #include "rsTestSupport.h"
@@ -27,11 +25,7 @@ struct Ref {  // a colour in double for the reference formulas
     double a;
 };
 
-std::string describe(const Rgba& x) {
-    std::ostringstream os;
-    os << "(" << x.r << ", " << x.g << ", " << x.b << ", " << x.a << ")";
-    return os.str();
-}
+using Bits = std::array<std::uint32_t, 4>;  // a colour's exact bits
 
 // ---- An independent hexcone conversion, hue in degrees ------------------------------------------
 
@@ -173,8 +167,8 @@ void expectReference(const ModeCase& m, const Rgba& src, const Rgba& dst, double
     auto near = [tolerance](double g, double w) { return std::fabs(g - w) <= tolerance * std::max(1.0, std::fabs(w)); };
     if (near(got.r, want.c[0]) && near(got.g, want.c[1]) && near(got.b, want.c[2]) && near(got.a, want.a)) return;
     if (++failures <= 5)
-        ADD_FAILURE() << "mode " << int(m.mode) << " source " << describe(src) << " destination " << describe(dst) << " gave "
-                      << describe(got) << ", expected (" << want.c[0] << ", " << want.c[1] << ", " << want.c[2] << ", " << want.a << ")";
+        ADD_FAILURE() << "mode " << int(m.mode) << " source " << src << " destination " << dst << " gave "
+                      << got << ", expected (" << want.c[0] << ", " << want.c[1] << ", " << want.c[2] << ", " << want.a << ")";
 }
 
 // Channels on a grid of values with few significant bits, so that every branch decides the same
@@ -235,7 +229,7 @@ TEST(RsTransferFunc, ResultMayBeTheDestination) {
         Rgba separate, inPlace = dst;
         f(src, dst, separate);
         f(src, inPlace, inPlace);
-        EXPECT_EQ(describe(inPlace), describe(separate)) << "mode " << m;
+        EXPECT_EQ(std::bit_cast<Bits>(inPlace), std::bit_cast<Bits>(separate)) << "mode " << m;
     }
 }
 
@@ -253,9 +247,8 @@ TEST(RsTransferFunc, DissolveDrawsOncePerCallAndPassesAllOrNothing) {
         Rgba got(-9, -9, -9, -9);
         RsTransferFunc::dissolve(Rgba(0.7f, 1.5f, -0.25f, sa), dst, got);
         const Rgba want = passes ? Rgba(0.7f, 1.5f, -0.25f, 1.0f) : dst;
-        using Bits = std::array<std::uint32_t, 4>;
         EXPECT_EQ(std::bit_cast<Bits>(got), std::bit_cast<Bits>(want))
-            << "alpha " << sa << " gave " << describe(got);
+            << "alpha " << sa << " gave " << got;
         RnNumRecUniformRng<float> shared = RsTransferFunc::_rand;
         EXPECT_EQ(shared.eval(), twin.eval());
     }
