@@ -20,7 +20,8 @@ TYPED_TEST_SUITE(RsCeil, Floats);
 TYPED_TEST(RsCeil, AgreesWithCeilEverywhere) {
     using T = TypeParam;
     using L = std::numeric_limits<T>;
-    std::vector<T> values = {T(0), -T(0), L::denorm_min(), -L::denorm_min(), L::min(), T(0.5), T(-0.5), T(1e-30), T(-1e-30)};
+    std::vector<T> values = {T(0),   -T(0),   L::denorm_min(), -L::denorm_min(), L::min(),
+                             T(0.5), T(-0.5), T(1e-30),        T(-1e-30)};
     for (int i = -2000; i <= 2000; ++i)
         values.insert(values.end(), {T(i), std::nextafter(T(i), T(1e9)), std::nextafter(T(i), T(-1e9)), T(i) + T(0.5)});
     // Up to the magnitude where the unit in the last place reaches 1 (2^24 in float), and to the

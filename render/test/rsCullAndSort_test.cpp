@@ -20,7 +20,8 @@ namespace {
 using namespace RsTest;
 
 // A projection looking down negative z, possibly off centre, perspective or parallel.
-GeProjectiveMatrix3<double> frustumProjection(bool parallel, double l, double r, double b, double t, double n, double f) {
+GeProjectiveMatrix3<double> frustumProjection(bool parallel, double l, double r, double b, double t, double n,
+                                              double f) {
     if (parallel)
         return {2 / (r - l), 0, 0, -(r + l) / (r - l), 0, 2 / (t - b), 0, -(t + b) / (t - b),
                 0, 0, -2 / (f - n), -(f + n) / (f - n), 0, 0, 0, 1};
@@ -114,12 +115,14 @@ TEST(RsCullAndSort, SelectionMatchesBruteForceOnRandomScenes) {
         for (int i = 0; i < 20; ++i) {
             const GePoint3<float> c(2 * u(rng), 2 * u(rng), 2 * u(rng));
             const GePoint3<float> h(0.05f + std::abs(u(rng)), 0.05f + std::abs(u(rng)), 0.05f + std::abs(u(rng)));
-            boxes.emplace_back(GePoint3<float>(c.x - h.x, c.y - h.y, c.z - h.z), GePoint3<float>(c.x + h.x, c.y + h.y, c.z + h.z));
+            boxes.emplace_back(GePoint3<float>(c.x - h.x, c.y - h.y, c.z - h.z),
+                               GePoint3<float>(c.x + h.x, c.y + h.y, c.z + h.z));
             const bool flag = u(rng) < 0.6f;
             instances.push_back(makeInstance(makeBoxMesh(boxes.back().getMin(), boxes.back().getMax()),
                                              randomPlacement(rng, 25.0f), makeAttributes(0, flag, !flag)));
         }
-        const std::vector<RsGeomInstance*> got = run(makeScene(instances), casters, GeFrustum<double>(projection), worldToView);
+        const std::vector<RsGeomInstance*> got =
+            run(makeScene(instances), casters, GeFrustum<double>(projection), worldToView);
         std::vector<RsGeomInstance*> survivors;
         bool anyUnsure = false;
         for (std::size_t i = 0; i < instances.size(); ++i) {
@@ -164,9 +167,9 @@ TEST(RsCullAndSort, OrderMatchesAStableReferenceWithManyTies) {
     for (int trial = 0; trial < 300; ++trial) {
         std::vector<RCShdPtr<RsGeomInstance>> instances;
         for (int i = count(rng); i > 0; --i)
-            instances.push_back(makeInstance(meshes[shape(rng)],
-                                             GeAffineMatrix3<float>::makeTranslation({10.0f * order(rng), 0, 2.0f * depth(rng)}),
-                                             makeAttributes(order(rng), order(rng) != 1, order(rng) != -1)));
+            instances.push_back(makeInstance(
+                meshes[shape(rng)], GeAffineMatrix3<float>::makeTranslation({10.0f * order(rng), 0, 2.0f * depth(rng)}),
+                makeAttributes(order(rng), order(rng) != 1, order(rng) != -1)));
         const RCShdPtr<RsScene> scene = makeScene(instances);
         for (bool casters : {false, true}) {
             std::vector<RsGeomInstance*> admitted;

@@ -33,7 +33,8 @@ RsDrawContext makeContext(RsMaterialShader& material, RsTransferFunc::Function t
 }
 
 // Feeds the pixels [x1, x2) of region-relative row `row` to the span method of the buffer's mode.
-void feedSpan(RsFZBuffer& buffer, const RsDrawContext& context, int row, int x1, int x2, int id, double z0, double slope) {
+void feedSpan(RsFZBuffer& buffer, const RsDrawContext& context, int row, int x1, int x2, int id, double z0,
+              double slope) {
     RsPixelData<RsPlainVertex> data{};
     data._w._q = 1.0;
     data._z._q = z0;
@@ -134,7 +135,8 @@ TEST(RsFZBuffer, ListsMatchTheModelInBothModes) {
                             got.push_back(f);
                         ASSERT_EQ(got.size(), e.list.size()) << "pixel " << x << "," << y << " after span " << id;
                         for (std::size_t i = 0; i < got.size(); ++i) {
-                            EXPECT_EQ(int(got[i]->_color.r), e.list[i].id) << "pixel " << x << "," << y << " entry " << i;
+                            EXPECT_EQ(int(got[i]->_color.r), e.list[i].id)
+                                << "pixel " << x << "," << y << " entry " << i;
                             EXPECT_EQ(int(got[i]->_color.g), e.list[i].x);
                             EXPECT_EQ(got[i]->_depth, e.list[i].depth);
                             EXPECT_EQ(got[i]->_transfer, e.list[i].transfer);
@@ -160,7 +162,8 @@ TEST(RsFZBuffer, MemoryAccountGrowsByWholeChunks) {
                          layer, 0.5 - 0.1 * layer, 0.0);
         EXPECT_EQ(material._calls, 30);
         EXPECT_EQ(buffer.getPool().getChunkCount(), 3u);
-        EXPECT_EQ(buffer.getMemorySize(), sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel + 20 * sizeof(RsFragment));
+        EXPECT_EQ(buffer.getMemorySize(),
+                  sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel + 20 * sizeof(RsFragment));
     }
 }
 
@@ -197,7 +200,8 @@ TEST(RsFZBufferFactory, BuffersTakeTheFactorysRegionModeAndSettings) {
                             if (unpremultiply) pixel = Rgba(s.r, s.g, s.b, pixel.a);
                             want = accumulate ? initial + pixel : pixel;
                         }
-                        expectNearRgba(pixelColour(output, x, y), want, 1e-6, std::to_string(x) + "," + std::to_string(y));
+                        expectNearRgba(pixelColour(output, x, y), want, 1e-6,
+                                       std::to_string(x) + "," + std::to_string(y));
                     }
             }
 }

@@ -28,7 +28,8 @@ double referenceWeight(int type, double x, double y) {
     switch (type) {
     case 0: return (x >= 1.0 || y >= 1.0) ? 0.0 : 1.0;
     case 1: return r < 1.0 ? 1.0 - r : 0.0;
-    case 2: return r >= bellRadius ? 0.0 : r > bellKnee ? std::pow(bellRadius - r, 2) / bellDivisor : 1.0 - bellSlope * r2;
+    case 2:
+        return r >= bellRadius ? 0.0 : r > bellKnee ? std::pow(bellRadius - r, 2) / bellDivisor : 1.0 - bellSlope * r2;
     case 3: return r < 0.5 ? 0.75 - r2 : r < 1.5 ? 0.5 * std::pow(r - 1.5, 2) : 0.0;
     case 4: return gaussScale * std::exp(-2.0 * r2);
     case 5: return std::exp2(-2.0 * r2);
@@ -57,7 +58,8 @@ TEST(RsFilterKernel, EveryKernelMatchesTheReferenceTableOverAGrid) {
             for (float y : coords) {
                 const double expected = referenceWeight(type, x, y), actual = kernel.evaluateKernel(x, y);
                 if (std::fabs(actual - expected) > tolerance && ++failures <= 5)
-                    ADD_FAILURE() << "kernel " << type << " at (" << x << ", " << y << "): " << actual << " expected " << expected;
+                    ADD_FAILURE() << "kernel " << type << " at (" << x << ", " << y << "): " << actual << " expected "
+                                  << expected;
             }
         EXPECT_EQ(failures, 0) << "kernel " << type;
     }

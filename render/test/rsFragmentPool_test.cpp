@@ -39,7 +39,8 @@ TEST(RsFragmentPool, GrowsByWholeChunksWhenTheCurrentOneIsUsedUp) {
             for (int i = 0; i < perChunk * 3 + 1; ++i) {
                 RsFragment* f = pool.allocate();
                 ASSERT_EQ(reinterpret_cast<std::uintptr_t>(f) % alignof(RsFragment), 0u);
-                ASSERT_EQ(pool.getChunkCount(), std::size_t(i / perChunk + 1)) << perChunk << " per chunk, fragment " << i;
+                ASSERT_EQ(pool.getChunkCount(), std::size_t(i / perChunk + 1))
+                    << perChunk << " per chunk, fragment " << i;
                 ASSERT_EQ(pool.getFreeFragments(), std::size_t(perChunk - 1 - i % perChunk));
                 if (i % perChunk != 0) ASSERT_EQ(f, fragments.back() + 1);
                 fragments.push_back(f);

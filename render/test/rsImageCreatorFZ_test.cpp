@@ -60,7 +60,8 @@ TEST(RsImageCreatorFZ, EveryFormatBackgroundAndFillMatchesThePerPixelReference) 
         std::nullopt, GeRectangle<int>{-10, 20, 0, 20}, GeRectangle<int>{-2, 5, 7, 9},
         GeRectangle<int>{-9, 2, 8, 30}, GeRectangle<int>{9, 30, 0, 20}, GeRectangle<int>{-10, 20, 11, 15}};
     const Rgba fills[] = {Rgba(0.0f, 0.0f, 0.0f, 1.0f), Rgba(0.3f, 0.6f, 0.9f, 0.25f)};
-    const std::pair<float, bool> weights[] = {{1.0f, false}, {std::nextafter(1.0f, 2.0f), false}, {0.5f, true}, {0.7f, true}};
+    const std::pair<float, bool> weights[] = {
+        {1.0f, false}, {std::nextafter(1.0f, 2.0f), false}, {0.5f, true}, {0.7f, true}};
     std::mt19937 rng(23);
     std::uniform_int_distribution<int> count(0, 3), mode(0, SdMaterial::transferModeCount - 1);
     std::uniform_real_distribution<float> colour(-0.2f, 1.3f), alpha(0.0f, 1.2f);
@@ -81,13 +82,15 @@ TEST(RsImageCreatorFZ, EveryFormatBackgroundAndFillMatchesThePerPixelReference) 
                                     for (int n = count(rng); n > 0; --n) {
                                         const int m = mode(rng);
                                         lists.add(x, y, Rgba(colour(rng), colour(rng), colour(rng), alpha(rng)),
-                                                  RsTransferFunc::getFunction(m == int(Mode::dissolve) ? Mode::normal : Mode(m)));
+                                                  RsTransferFunc::getFunction(m == int(Mode::dissolve) ? Mode::normal
+                                                                                                       : Mode(m)));
                                     }
                             const IxWriteGuard output = makeTile(out, outputRect);
                             fillRandomValues(output, rng, 0.0f, 1.0f);
                             const std::vector<unsigned char> before = snapshot(output);
                             const IxWriteGuard old = makeTile(out, outputRect);
-                            std::memcpy(old.getPixelAddress(outputRect.x0, outputRect.y0), before.data(), before.size());
+                            std::memcpy(old.getPixelAddress(outputRect.x0, outputRect.y0), before.data(),
+                                        before.size());
                             RsImageCreatorFZ::createImage(lists.heads.data(), region, accumulate, weight, unpremultiply,
                                                           fill, bg ? IxReadGuard(bgTile) : IxReadGuard(), output);
                             for (int y = outputRect.y0; y < outputRect.y1; ++y)
@@ -95,19 +98,22 @@ TEST(RsImageCreatorFZ, EveryFormatBackgroundAndFillMatchesThePerPixelReference) 
                                     const bool inRegion = region.contains(x, y);
                                     Rgba expected;
                                     if (inRegion)
-                                        expected = referencePixel(bg && bg->contains(x, y) ? pixelColour(bgTile, x, y) : fill,
-                                                                  lists.heads[(y - region.y0) * region.getWidth() + x - region.x0],
-                                                                  scales, weight, unpremultiply);
+                                        expected = referencePixel(
+                                            bg && bg->contains(x, y) ? pixelColour(bgTile, x, y) : fill,
+                                            lists.heads[(y - region.y0) * region.getWidth() + x - region.x0], scales,
+                                            weight, unpremultiply);
                                     for (int c = 0; c < out.comps; ++c) {
                                         const std::uint32_t was = rawChannel(old, x, y, c);
                                         const float value = channelOf(expected, rgbaIndexOf(out.comps, c));
                                         std::uint32_t want = was;
                                         if (inRegion && !accumulate) want = floatToBits(out.depth, value);
-                                        if (inRegion && accumulate && expected.a != 0.0f) want = addToBits(out.depth, was, value);
+                                        if (inRegion && accumulate && expected.a != 0.0f)
+                                            want = addToBits(out.depth, was, value);
                                         ASSERT_EQ(rawChannel(output, x, y, c), want)
                                             << "output " << out.comps << "x" << out.depth << ", background " << b
-                                            << ", accumulate " << accumulate << ", weight " << weight << ", unpremultiply "
-                                            << unpremultiply << ", pixel " << x << "," << y << " channel " << c;
+                                            << ", accumulate " << accumulate << ", weight " << weight
+                                            << ", unpremultiply " << unpremultiply << ", pixel " << x << "," << y
+                                            << " channel " << c;
                                     }
                                 }
                         }
@@ -128,8 +134,10 @@ TEST(RsImageCreatorFZ, UnpremultiplyStopsAtItsLimit) {
     };
     for (const auto& [start, expected] : cases) {
         const IxWriteGuard output = makeTile({4, 32}, {0, 1, 0, 1});
-        RsImageCreatorFZ::createImage(Lists(1, 1).heads.data(), {0, 1, 0, 1}, false, 1.0f, true, start, IxReadGuard(), output);
-        expectNearRgba(pixelColour(output, 0, 0), expected, expected.r == 0.0f ? 0.0 : 1e-6, "start alpha " + std::to_string(start.a));
+        RsImageCreatorFZ::createImage(Lists(1, 1).heads.data(), {0, 1, 0, 1}, false, 1.0f, true, start, IxReadGuard(),
+                                      output);
+        expectNearRgba(pixelColour(output, 0, 0), expected, expected.r == 0.0f ? 0.0 : 1e-6,
+                       "start alpha " + std::to_string(start.a));
     }
 }
 
@@ -140,8 +148,8 @@ TEST(RsImageCreatorFZ, FailuresAndEmptyRegionsWriteNothingMore) {
     IxTile complexTile(IxPixelFormat(IxPixelFormat::RGBA, IxPixelFormat::COMPLEX), {0, 2, 0, 2}, Rgba(0.25f, 0, 0, 0));
     const IxWriteGuard complexOut(complexTile);
     const std::vector<unsigned char> complexBefore = snapshot(complexOut);
-    EXPECT_THROW(RsImageCreatorFZ::createImage(Lists(2, 2).heads.data(), {0, 2, 0, 2}, false, 1.0f, true, Rgba(1, 1, 1, 1),
-                                               IxReadGuard(), complexOut),
+    EXPECT_THROW(RsImageCreatorFZ::createImage(Lists(2, 2).heads.data(), {0, 2, 0, 2}, false, 1.0f, true,
+                                               Rgba(1, 1, 1, 1), IxReadGuard(), complexOut),
                  ExProgramAborted);
     EXPECT_EQ(snapshot(complexOut), complexBefore);
 
@@ -150,7 +158,8 @@ TEST(RsImageCreatorFZ, FailuresAndEmptyRegionsWriteNothingMore) {
     fillRandomValues(output, rng, 0.0f, 1.0f);
     const std::vector<unsigned char> before = snapshot(output);
     for (const GeRectangle<int>& empty : {GeRectangle<int>{1, 1, 0, 4}, GeRectangle<int>{0, 4, 2, 2}})
-        RsImageCreatorFZ::createImage(Lists(4, 4).heads.data(), empty, false, 1.0f, true, Rgba(1, 1, 1, 1), IxReadGuard(output), output);
+        RsImageCreatorFZ::createImage(Lists(4, 4).heads.data(), empty, false, 1.0f, true, Rgba(1, 1, 1, 1),
+                                      IxReadGuard(output), output);
     EXPECT_EQ(snapshot(output), before);
 
     Lists lists(3, 4);

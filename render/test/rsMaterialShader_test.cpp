@@ -163,13 +163,14 @@ TEST(RsMaterialShader, CreateSamplerHandsOutTheMapsSamplerOrAWhiteOne) {
     const Rgba white(1.0f, 1.0f, 1.0f, 1.0f);
     const GePoint2<double> at(0.3, 0.7);
     const GeLinearMatrix2<double> footprint(0.01, 0.0, 0.0, 0.01);
-    for (const Params& params : {Params(), Params(makeShared<ConstantParams>(Rgba(0.2f, 0.2f, 0.2f, 0.2f), 1.0f, true))}) {
+    for (const Params& params :
+         {Params(), Params(makeShared<ConstantParams>(Rgba(0.2f, 0.2f, 0.2f, 0.2f), 1.0f, true))}) {
         const OPtr<SdTextureSampler> sampler = HelperAccess::createSampler(params);
         ASSERT_TRUE(sampler);
         sampler->releaseTiles();
         for (const Rgba& got : {sampler->sample(at, footprint), sampler->sample(at, GeLinearMatrix2<float>(footprint)),
-                                sampler->sample(at, 0.1, 0.1), sampler->sample(3, 4), sampler->sample(3, 4, 0.25f, 0.75f),
-                                sampler->sample(3, 4, GeLinearMatrix2<float>())})
+                                sampler->sample(at, 0.1, 0.1), sampler->sample(3, 4),
+                                sampler->sample(3, 4, 0.25f, 0.75f), sampler->sample(3, 4, GeLinearMatrix2<float>())})
             EXPECT_EQ(got, white);
     }
     const Rgba colour(0.1f, 0.2f, 0.3f, 0.4f);
@@ -202,7 +203,8 @@ TEST(RsMaterialShader, ScaleByTextureFoldsMapWeightsIntoColours) {
                 EXPECT_EQ(HelperAccess::scaleByTexture(c, alpha, map1), Rgba(one, alpha));
             EXPECT_EQ(HelperAccess::scaleByTextures(c, map1, Params()), one);
             EXPECT_EQ(HelperAccess::scaleByTextures(c, Params(), map1), one);
-            for (float w2 : weights) expectScaled(HelperAccess::scaleByTextures(c, map1, makeMap(w2)), c, double(w1) * w2);
+            for (float w2 : weights)
+                expectScaled(HelperAccess::scaleByTextures(c, map1, makeMap(w2)), c, double(w1) * w2);
         }
     }
 }

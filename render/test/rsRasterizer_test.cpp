@@ -54,9 +54,10 @@ protected:
         const ReferenceTriangle ref = h.reference(a, b, c);
         EXPECT_EQ(h._buffer._errors, 0);
         long inBox = 0;
-        for (i64 sy = std::max<i64>(ref.rowBegin() - 2, 0); sy < std::min<i64>(ref.rowEnd() + 2, h._buffer._samplesY); ++sy)
-            for (i64 sx = std::max<i64>(ref.colBegin() - 2, 0); sx < std::min<i64>(ref.colEnd() + 2, h._buffer._samplesX);
-                 ++sx) {
+        for (i64 sy = std::max<i64>(ref.rowBegin() - 2, 0); sy < std::min<i64>(ref.rowEnd() + 2, h._buffer._samplesY);
+             ++sy)
+            for (i64 sx = std::max<i64>(ref.colBegin() - 2, 0);
+                 sx < std::min<i64>(ref.colEnd() + 2, h._buffer._samplesX); ++sx) {
                 const int got = h._buffer.count(int(sx), int(sy));
                 inBox += got;
                 ASSERT_EQ(got, ref.covers(sx, sy) ? 1 : 0)
@@ -81,14 +82,16 @@ protected:
                 bool in = false;
                 double nearest = 1e300;
                 for (std::size_t i = 0, j = w.size() - 1; i < w.size(); j = i++) {
-                    const double ax = double(w[j].x), ay = double(w[j].y), dx = double(w[i].x) - ax, dy = double(w[i].y) - ay;
+                    const double ax = double(w[j].x), ay = double(w[j].y), dx = double(w[i].x) - ax,
+                                 dy = double(w[i].y) - ay;
                     if ((ay > py) != (ay + dy > py) && px < ax + (py - ay) * dx / dy) in = !in;
                     const double t = std::clamp(((px - ax) * dx + (py - ay) * dy) / (dx * dx + dy * dy), 0.0, 1.0);
                     nearest = std::min(nearest, std::hypot(px - ax - t * dx, py - ay - t * dy));
                 }
                 const int got = h._buffer.count(sx, sy);
                 if (got > 1 || (nearest / kWalkUnit >= nearDistance && got != (in ? 1 : 0))) {
-                    ADD_FAILURE() << "sample " << sx << ", " << sy << (in ? " inside" : " outside") << " covered " << got;
+                    ADD_FAILURE() << "sample " << sx << ", " << sy << (in ? " inside" : " outside") << " covered "
+                                  << got;
                     return inside;
                 }
                 inside += in && nearest / kWalkUnit >= nearDistance;
@@ -129,9 +132,11 @@ TYPED_TEST(RsRasterizer, ExactInputsFollowTheFillRuleExactly) {
     for (int n = 0; n < 400 && !::testing::Test::HasFailure(); ++n) {
         const i64 d = quarter << heightExp(rng);
         const int kind = shape(rng);  // general, flat top, flat bottom
-        const i64 top = region.y0 * u + quarter * std::uniform_int_distribution<i64>(0, (height - (kind == 0 ? 2 * d : d)) / quarter - 1)(rng);
-        std::array<i64, 3> ys = kind == 0 ? std::array<i64, 3>{top, top + d, top + 2 * d}
-                                : kind == 1 ? std::array<i64, 3>{top, top, top + d} : std::array<i64, 3>{top, top + d, top + d};
+        const i64 top = region.y0 * u + quarter * std::uniform_int_distribution<i64>(
+                                                      0, (height - (kind == 0 ? 2 * d : d)) / quarter - 1)(rng);
+        std::array<i64, 3> ys = kind == 0   ? std::array<i64, 3>{top, top + d, top + 2 * d}
+                                : kind == 1 ? std::array<i64, 3>{top, top, top + d}
+                                            : std::array<i64, 3>{top, top + d, top + d};
         std::shuffle(ys.begin(), ys.end(), rng);
         std::array<Pt, 3> p;
         for (int i = 0; i < 3; ++i) p[i] = {region.x0 * u + quarter * column(rng), ys[i]};
@@ -147,7 +152,8 @@ TYPED_TEST(RsRasterizer, FansAreWatertight) {
     const double sx = 1.0 / (1 << TestFixture::kXBits), sy = 1.0 / (1 << TestFixture::kYBits);
     long inside = 0;
     // Fans: radii in samples of the grain, points, region size in samples.
-    const std::array<double, 4> fans[] = {{0.05, 0.4, 9, 64}, {0.5, 3, 7, 64}, {4, 30, 12, 160}, {60, 70, 5, 160}, {20, 70, 30, 160}};
+    const std::array<double, 4> fans[] = {
+        {0.05, 0.4, 9, 64}, {0.5, 3, 7, 64}, {4, 30, 12, 160}, {60, 70, 5, 160}, {20, 70, 30, 160}};
     for (const auto& [radiusMin, radiusMax, points, samples] : fans)
         for (int rep = 0; rep < 6; ++rep) {
             const GeRectangle<int> region = TestFixture::region(int(samples), int(samples));
@@ -155,11 +161,13 @@ TYPED_TEST(RsRasterizer, FansAreWatertight) {
             const bool snap = rep % 2 == 0;
             Pt centre{randomCoord(rng, region.x0 + region.getWidth() * 0.47, region.x0 + region.getWidth() * 0.53),
                       randomCoord(rng, region.y0 + region.getHeight() * 0.47, region.y0 + region.getHeight() * 0.53)};
-            if (snap) centre = {snapToSample(centre.x, TestFixture::kXBits), snapToSample(centre.y, TestFixture::kYBits)};
+            if (snap)
+                centre = {snapToSample(centre.x, TestFixture::kXBits), snapToSample(centre.y, TestFixture::kYBits)};
             std::vector<double> angles;
             for (double gap = 10; gap >= 0.9 * M_PI;) {  // no gap of half a turn: the centre stays inside
                 angles.clear();
-                for (int i = 0; i < int(points); ++i) angles.push_back(std::uniform_real_distribution<double>(0, 2 * M_PI)(rng));
+                for (int i = 0; i < int(points); ++i)
+                    angles.push_back(std::uniform_real_distribution<double>(0, 2 * M_PI)(rng));
                 std::sort(angles.begin(), angles.end());
                 gap = angles.front() + 2 * M_PI - angles.back();
                 for (std::size_t i = 1; i < angles.size(); ++i) gap = std::max(gap, angles[i] - angles[i - 1]);
@@ -168,7 +176,8 @@ TYPED_TEST(RsRasterizer, FansAreWatertight) {
             for (double a : angles) {
                 const double r = std::uniform_real_distribution<double>(radiusMin, radiusMax)(rng);
                 Pt p{centre.x + i64(std::cos(a) * r * sx * u), centre.y + i64(std::sin(a) * r * sy * u)};
-                if (snap && outline.size() % 2 == 0) p = {snapToSample(p.x, TestFixture::kXBits), snapToSample(p.y, TestFixture::kYBits)};
+                if (snap && outline.size() % 2 == 0)
+                    p = {snapToSample(p.x, TestFixture::kXBits), snapToSample(p.y, TestFixture::kYBits)};
                 outline.push_back(p);
             }
             for (std::size_t i = 0; i < outline.size(); ++i)
@@ -231,14 +240,18 @@ struct Functions {
     std::array<Linear, 3> eye, tex, normal, binormal, tangent;
     explicit Functions(std::mt19937& rng) {
         std::uniform_real_distribution<double> slope(0.25, 0.5), offset(-5, 5);
-        auto make = [&] { return Linear{slope(rng) * (rng() % 2 ? 1 : -1), slope(rng) * (rng() % 2 ? 1 : -1), offset(rng)}; };
+        auto make = [&] {
+            return Linear{slope(rng) * (rng() % 2 ? 1 : -1), slope(rng) * (rng() % 2 ? 1 : -1), offset(rng)};
+        };
         w = make(), z = make(), eyeZ = make();
         for (auto* set : {&eye, &tex, &normal, &binormal, &tangent})
             for (Linear& l : *set) l = make();
     }
 };
 
-GePoint3<double> pointAt(const std::array<Linear, 3>& f, double x, double y) { return {f[0].at(x, y), f[1].at(x, y), f[2].at(x, y)}; }
+GePoint3<double> pointAt(const std::array<Linear, 3>& f, double x, double y) {
+    return {f[0].at(x, y), f[1].at(x, y), f[2].at(x, y)};
+}
 
 template <class Vertex>
 Vertex attributedVertex(Pt p, const Functions& f) {
@@ -264,7 +277,8 @@ template <class PixelData>
 void measure(const PixelData& d, const Functions& f, double x, double y, Errors& e) {
     auto dbl = [&](double got, double want) { e.doubles = std::max(e.doubles, std::abs(got - want)); };
     auto flt3 = [&](const GePoint3<float>& got, const std::array<Linear, 3>& fn) {
-        e.floats = std::max({e.floats, std::abs(got.x - fn[0].at(x, y)), std::abs(got.y - fn[1].at(x, y)), std::abs(got.z - fn[2].at(x, y))});
+        e.floats = std::max({e.floats, std::abs(got.x - fn[0].at(x, y)), std::abs(got.y - fn[1].at(x, y)),
+                             std::abs(got.z - fn[2].at(x, y))});
     };
     if constexpr (PixelData::kHasW) dbl(d._w._q, f.w.at(x, y));
     if constexpr (PixelData::kHasZ) {
@@ -273,7 +287,8 @@ void measure(const PixelData& d, const Functions& f, double x, double y, Errors&
     }
     if constexpr (PixelData::kHasEyeZ) dbl(d._eyeZ._q, f.eyeZ.at(x, y));
     if constexpr (PixelData::kHasEyeCoord) flt3(d._eyeCoord._q, f.eye);
-    if constexpr (PixelData::kHasTexCoord) dbl(d._texCoord._q.x, f.tex[0].at(x, y)), dbl(d._texCoord._q.y, f.tex[1].at(x, y));
+    if constexpr (PixelData::kHasTexCoord)
+        dbl(d._texCoord._q.x, f.tex[0].at(x, y)), dbl(d._texCoord._q.y, f.tex[1].at(x, y));
     if constexpr (PixelData::kHasNormal) flt3(d._normal._q, f.normal);
     if constexpr (PixelData::kHasBinormal) flt3(d._binormal._q, f.binormal);
     if constexpr (PixelData::kHasTangent) flt3(d._tangent._q, f.tangent);
@@ -306,15 +321,16 @@ TYPED_TEST(RsRasterizerPixelData, AttributesAreLinearAtEveryPixelWhateverTheTili
         triangles.emplace_back(p, Functions(rng));
     }
     std::vector<int> coverage;
-    for (const auto& [blockWidth, blockHeight] : {std::pair{1000, 1000}, std::pair{1, 1}, std::pair{3, 5}, std::pair{8, 2}, std::pair{64, 64}}) {
+    for (const auto& [blockWidth, blockHeight] :
+         {std::pair{1000, 1000}, std::pair{1, 1}, std::pair{3, 5}, std::pair{8, 2}, std::pair{64, 64}}) {
         H h(region, blockWidth, blockHeight);
         Errors errors;
         for (const auto& [p, f] : triangles) {
             h._buffer._onPixel = [&](int px, int py, const typename H::Buffer::PixelData& d) {
                 measure(d, f, region.x0 + px + 0.5, region.y0 + py + 0.5, errors);
             };
-            h._rasterizer.rasterizeTriangle(h._context, attributedVertex<Vertex>(p[0], f), attributedVertex<Vertex>(p[1], f),
-                                            attributedVertex<Vertex>(p[2], f));
+            h._rasterizer.rasterizeTriangle(h._context, attributedVertex<Vertex>(p[0], f),
+                                            attributedVertex<Vertex>(p[1], f), attributedVertex<Vertex>(p[2], f));
         }
         SCOPED_TRACE(::testing::Message() << "blocks " << blockWidth << " x " << blockHeight);
         EXPECT_GT(errors.pixels, 1000);

@@ -65,7 +65,9 @@ TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
             MaterialSettings settings(layer.colour);
             if (instances.size() % 2) {
                 settings.needed = 0x02u;
-                settings.probe = [c = layer.colour](const RsShadingContext& s) { return s._normal.z > 0 ? c : Rgba(1, 0, 1, 1); };
+                settings.probe = [c = layer.colour](const RsShadingContext& s) {
+                    return s._normal.z > 0 ? c : Rgba(1, 0, 1, 1);
+                };
             }
             instances.push_back(drawn(quad(w, h, front ? x0 : x1, front ? x1 : x0, y0, y1, z), settings));
             instances.back()->_drawFrontFaces = rng() % 3 != 0;
@@ -87,7 +89,8 @@ TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
                     if (l.pixels.contains(x, y)) here.push_back(l.colour);
                 const Rgba want = overComposite(fill, here);
                 expectNearRgba(withZ.at(x, y), want, 1e-5, "with Z at " + std::to_string(x) + "," + std::to_string(y));
-                expectNearRgba(withoutZ.at(x, y), want, 1e-5, "without Z at " + std::to_string(x) + "," + std::to_string(y));
+                expectNearRgba(withoutZ.at(x, y), want, 1e-5,
+                               "without Z at " + std::to_string(x) + "," + std::to_string(y));
             }
     }
 }
@@ -105,14 +108,16 @@ TEST(RsRenderer, LightsArePreparedOnEveryCallEvenWithoutInstances) {
         std::string _name;
     };
     std::vector<std::string> log;
-    const RCShdPtr<RsScene> scene = makeScene({}, {makeShared<OrderedLight>(log, "a"), makeShared<OrderedLight>(log, "b")});
+    const RCShdPtr<RsScene> scene =
+        makeScene({}, {makeShared<OrderedLight>(log, "a"), makeShared<OrderedLight>(log, "b")});
     const GeRectangle<int> rect{3, 9, -2, 5};
     const Rgba fill(0.25f, 0.5f, 0.75f, 1.0f);
     RsRenderer renderer;
     renderer.setFillColor(fill);
     Picture picture(rect, Rgba(0, 0, 0, 0));
     for (int call = 0; call < 2; ++call)
-        renderer.render(GeAffineMatrix3<float>(1, 0, 0, 2, 0, 1, 0, 0, 0, 0, 1, -1), perspective(1.0, 0.1, 10.0), scene, rect, picture.guard);
+        renderer.render(GeAffineMatrix3<float>(1, 0, 0, 2, 0, 1, 0, 0, 0, 0, 1, -1), perspective(1.0, 0.1, 10.0), scene,
+                        rect, picture.guard);
     const std::vector<std::string> once = {"a setup 2.000000", "a maps", "b setup 2.000000", "b maps"};
     std::vector<std::string> twice = once;
     twice.insert(twice.end(), once.begin(), once.end());
@@ -125,7 +130,8 @@ TEST(RsRenderer, LightsArePreparedOnEveryCallEvenWithoutInstances) {
 // path is missing: it fails before touching a pixel.
 TEST(RsRenderer, CameraInstancesAndFailures) {
     const GeRectangle<int> rect{0, 24, 0, 16};
-    const RCShdPtr<RsScene> scene = makeScene({drawn(makeMesh({{-1, -1, -3}, {1, -1, -3}, {0, 1, -3}}, {0, 1, 2}), {})});
+    const RCShdPtr<RsScene> scene =
+        makeScene({drawn(makeMesh({{-1, -1, -3}, {1, -1, -3}, {0, 1, -3}}, {0, 1, 2}), {})});
     const Rgba untouched(0.25f, 0.5f, 0.75f, 1.0f);
     RsRenderer renderer;
     RCShdPtr<SdCamera> sdCamera = makeShared<SdCamera>();
@@ -202,11 +208,22 @@ TEST(RsRenderer, CancelFromAnotherThreadEndsTheRender) {
 // crash, a hang, another exception or a sanitizer report fails the test.
 TEST(RsRenderer, HostileScenesGiveAPictureOrTheLibrarysException) {
     std::mt19937 rng(2718);
-    const float specials[] = {std::numeric_limits<float>::quiet_NaN(), std::numeric_limits<float>::infinity(),
-                              -std::numeric_limits<float>::infinity(), 1e30f, -1e30f, 3e38f, 1e-30f, 0.0f, 1e7f, 1e20f, -1e20f, -3e38f};
+    const float specials[] = {std::numeric_limits<float>::quiet_NaN(),
+                              std::numeric_limits<float>::infinity(),
+                              -std::numeric_limits<float>::infinity(),
+                              1e30f,
+                              -1e30f,
+                              3e38f,
+                              1e-30f,
+                              0.0f,
+                              1e7f,
+                              1e20f,
+                              -1e20f,
+                              -3e38f};
     auto pick = [&](int percent) { return int(rng() % 100) < percent; };
     auto value = [&](int percent, float lo, float hi) {
-        return pick(percent) ? specials[rng() % std::size(specials)] : std::uniform_real_distribution<float>(lo, hi)(rng);
+        return pick(percent) ? specials[rng() % std::size(specials)]
+                             : std::uniform_real_distribution<float>(lo, hi)(rng);
     };
     const unsigned int needs[] = {0x00u, 0x01u, 0x03u, 0x3cu, 0x3eu, 0x7fu};
     int pictures = 0, failures = 0;
@@ -228,10 +245,14 @@ TEST(RsRenderer, HostileScenesGiveAPictureOrTheLibrarysException) {
             settings.screenSpace = pick(50);
             settings.wireSize = value(20, 0, 3);
             GeAffineMatrix3<float> matrix;
-            if (pick(60)) matrix = GeAffineMatrix3<float>(value(30, -2, 2), value(20, -1, 1), 0, value(20, -1, 1),
-                                                          0, value(30, -2, 2), 0, value(20, -1, 1), 0, 0, value(30, -2, 2), value(20, -3, 1));
+            if (pick(60))
+                matrix =
+                    GeAffineMatrix3<float>(value(30, -2, 2), value(20, -1, 1), 0, value(20, -1, 1), 0, value(30, -2, 2),
+                                           0, value(20, -1, 1), 0, 0, value(30, -2, 2), value(20, -3, 1));
             try {
-                instances.push_back(drawn(makeMesh(vertices, triangles, pick(50) ? vertices : std::vector<GePoint3<float>>{}), settings, matrix));
+                instances.push_back(
+                    drawn(makeMesh(vertices, triangles, pick(50) ? vertices : std::vector<GePoint3<float>>{}), settings,
+                          matrix));
                 instances.back()->_renderOrder = int(rng() % 3) - 1;
             } catch (const ExBase&) {
                 ++failures;  // a mesh the builder refuses
@@ -239,12 +260,18 @@ TEST(RsRenderer, HostileScenesGiveAPictureOrTheLibrarysException) {
         }
         const int x0 = int(rng() % 20) - 10, y0 = int(rng() % 20) - 10;
         const int kind = int(rng() % 4);
-        const GeRectangle<int> rect{x0, x0 + (kind == 0 ? 0 : kind == 1 ? 1 : int(rng() % 24)), y0, y0 + (kind == 1 ? 1 : int(rng() % 24))};
+        const GeRectangle<int> rect{x0,
+                                    x0 + (kind == 0   ? 0
+                                          : kind == 1 ? 1
+                                                      : int(rng() % 24)),
+                                    y0, y0 + (kind == 1 ? 1 : int(rng() % 24))};
         // The output tile: the rectangle, one pixel of it, an empty tile, or one that overhangs it.
         const int tx = x0 + int(rng() % 4), ty = y0 + int(rng() % 4);
-        const GeRectangle<int> tiles[] = {rect, {tx, tx + 1, ty, ty + 1}, {tx, tx, ty, ty + 3}, {tx - 8, tx + 8, ty - 8, ty + 8}};
+        const GeRectangle<int> tiles[] = {
+            rect, {tx, tx + 1, ty, ty + 1}, {tx, tx, ty, ty + 3}, {tx - 8, tx + 8, ty - 8, ty + 8}};
         const GeProjectiveMatrix3<double> projection =
-            pick(50) ? perspective(value(10, 0.2f, 2.5f), value(10, 0.05f, 1), value(10, 2, 100)) : parallel(16, 16, value(10, 0.1f, 1), value(10, 2, 50));
+            pick(50) ? perspective(value(10, 0.2f, 2.5f), value(10, 0.05f, 1), value(10, 2, 100))
+                     : parallel(16, 16, value(10, 0.1f, 1), value(10, 2, 50));
         const GeRectangle<int> tile = tiles[rng() % 4];
         try {
             Picture picture(tile);

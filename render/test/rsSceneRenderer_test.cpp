@@ -134,7 +134,9 @@ TEST(RsSceneRenderer, ClippedTrianglesDrawExactlyTheirVisiblePart) {
         std::vector<GePoint3<float>> corners;
         for (int k = 0; k < 3; ++k) corners.emplace_back(xy(rng), xy(rng), depth(rng));
         MaterialSettings settings = counting(0x3cu);
-        settings.probe = [](const RsShadingContext& c) { return Rgba(float(c._texCoord.x), float(c._texCoord.y), 1, 1); };
+        settings.probe = [](const RsShadingContext& c) {
+            return Rgba(float(c._texCoord.x), float(c._texCoord.y), 1, 1);
+        };
         Picture picture(kRect);
         render(makeScene({drawn(makeMesh(corners, {0, 1, 2}), settings)}), kProjection, kRect, picture);
         for (int py = kRect.y0; py < kRect.y1; ++py)
@@ -156,8 +158,10 @@ TEST(RsSceneRenderer, ClippedTrianglesDrawExactlyTheirVisiblePart) {
 // eye position and their screen derivatives are those of the exact projective map.
 TEST(RsSceneRenderer, ShadingInputsArePerspectiveCorrect) {
     // From z = -1.2 to z = -62.8, turned about y as well, so that 1/w changes along both axes.
-    const std::vector<GePoint3<float>> corners = {{-2, -0.8f, -1.2f}, {2, -0.8f, -2.8f}, {2, 0.2f, -62.8f}, {-2, 0.2f, -61.2f}};
-    const RCShdPtr<const SdMesh> mesh = makeMesh(corners, {0, 1, 2, 0, 2, 3}, {{0, 0, 0}, {3, 0, 0}, {3, 7, 0}, {0, 7, 0}});
+    const std::vector<GePoint3<float>> corners = {
+        {-2, -0.8f, -1.2f}, {2, -0.8f, -2.8f}, {2, 0.2f, -62.8f}, {-2, 0.2f, -61.2f}};
+    const RCShdPtr<const SdMesh> mesh =
+        makeMesh(corners, {0, 1, 2, 0, 2, 3}, {{0, 0, 0}, {3, 0, 0}, {3, 7, 0}, {0, 7, 0}});
     // (s, t) and the eye point P of the plane point seen through pixel position (x, y):
     // P - a = alpha u + beta v.
     const V3 a = toV3(corners[0]), u = toV3(corners[1]) - a, v = toV3(corners[3]) - a, n = u.cross(v);
@@ -237,7 +241,9 @@ TEST(RsSceneRenderer, WireRingsCoverABandAlongTheEdges) {
         V3 t[3];
         for (int k = 0; k < 3; ++k) {
             const V3 c = toV3(corners[k]);
-            t[k] = screenSpace ? V3{32 + 32 * kProjection(0, 0) * c.x / -c.z, 24 + 24 * kProjection(1, 1) * c.y / -c.z, 0} : c;
+            t[k] = screenSpace
+                       ? V3{32 + 32 * kProjection(0, 0) * c.x / -c.z, 24 + 24 * kProjection(1, 1) * c.y / -c.z, 0}
+                       : c;
         }
         const double area2 = std::sqrt((t[1] - t[0]).cross(t[2] - t[0]).dot((t[1] - t[0]).cross(t[2] - t[0])));
         double perimeter = 0, longest = 0;
@@ -259,7 +265,8 @@ TEST(RsSceneRenderer, WireRingsCoverABandAlongTheEdges) {
                 const Hit hit = castRay(px, py, toV3(corners[0]), toV3(corners[1]), toV3(corners[2]));
                 if (hit.ambiguous) continue;
                 const V3 p = screenSpace ? V3{px + 0.5, py + 0.5, 0.0} : hit.point;
-                const double d = std::min({lineDistance(p, t[0], t[1]), lineDistance(p, t[1], t[2]), lineDistance(p, t[2], t[0])});
+                const double d =
+                    std::min({lineDistance(p, t[0], t[1]), lineDistance(p, t[1], t[2]), lineDistance(p, t[2], t[0])});
                 if (!whole && std::abs(d - width) < 1e-3 * std::max(1.0, width)) continue;
                 const bool expected = hit.seen && (whole || d < width);
                 EXPECT_EQ(count, expected ? 1.0f : 0.0f) << px << ", " << py << " trial " << trials;
@@ -292,11 +299,13 @@ TEST(RsSceneRenderer, PictureInManyRegionsEqualsEachWindowInOne) {
         Picture whole(rect);
         render(scene, kProjection, rect, whole);
         for (int w = 0; w < 4; ++w) {
-            const int x0 = rect.x0 + int(rng() % (rect.getWidth() - 128)), y0 = rect.y0 + int(rng() % (rect.getHeight() - 128));
+            const int x0 = rect.x0 + int(rng() % (rect.getWidth() - 128)),
+                      y0 = rect.y0 + int(rng() % (rect.getHeight() - 128));
             Picture window({x0, x0 + 128, y0, y0 + 128});
             render(scene, kProjection, rect, window);
             for (int y = y0; y < y0 + 128; ++y)
-                ASSERT_EQ(std::memcmp(window.guard.getPixelAddress(x0, y), whole.guard.getPixelAddress(x0, y), 16 * 128), 0)
+                ASSERT_EQ(
+                    std::memcmp(window.guard.getPixelAddress(x0, y), whole.guard.getPixelAddress(x0, y), 16 * 128), 0)
                     << "row " << y << " of window at " << x0 << ", " << y0;
         }
     }

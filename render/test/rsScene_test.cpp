@@ -51,8 +51,9 @@ TEST(RsGeomInstance, KeepsItsAttributesAndLightSet) {
         a._drawBackFaces = bits & 16;
         const RsGeomInstance i(GeAffineMatrix3<float>(), mesh, {}, {}, a, {3, 1, 3, 2, 1});
         EXPECT_EQ(i._renderOrder, a._renderOrder);
-        EXPECT_EQ((std::vector<bool>{i._visible, i._castsShadows, i._receivesShadows, i._drawFrontFaces, i._drawBackFaces}),
-                  (std::vector<bool>{a._visible, a._castsShadows, a._receivesShadows, a._drawFrontFaces, a._drawBackFaces}));
+        EXPECT_EQ(
+            (std::vector<bool>{i._visible, i._castsShadows, i._receivesShadows, i._drawFrontFaces, i._drawBackFaces}),
+            (std::vector<bool>{a._visible, a._castsShadows, a._receivesShadows, a._drawFrontFaces, a._drawBackFaces}));
         EXPECT_EQ(std::vector<unsigned int>(i._lights.begin(), i._lights.end()), (std::vector<unsigned int>{1, 2, 3}));
     }
 }
@@ -64,7 +65,8 @@ TEST(RsGeomInstance, WorldBoxHoldsTheTransformedCornersTightly) {
         const GeAffineMatrix3<float> matrix = randomAffine(rng, 3.0f);
         double lo[3] = {1e300, 1e300, 1e300}, hi[3] = {-1e300, -1e300, -1e300};
         growBoxInDouble({matrix}, objectBox, lo, hi);
-        expectBoxNear(makeInstance(makeBoxMesh(objectBox.getMin(), objectBox.getMax()), matrix)->getBoundingBox(), lo, hi, 1e-4);
+        expectBoxNear(makeInstance(makeBoxMesh(objectBox.getMin(), objectBox.getMax()), matrix)->getBoundingBox(), lo,
+                      hi, 1e-4);
     }
     EXPECT_THROW(makeInstance(RCShdPtr<const SdMesh>())->getBoundingBox(), ExNullPtr);
 }

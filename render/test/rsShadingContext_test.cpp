@@ -46,7 +46,8 @@ TEST(RsShadingContext, NormalizeOrZeroGivesTheUnitDirectionOrZero) {
         const GeVector3<float> v = toF(V(component(rng), component(rng), component(rng)) * scale);
         expectNear(RsShadingContext::normalizeOrZero(v), unit(toD(v)), 4e-7, "scale " + std::to_string(scale));
     }
-    for (const GeVector3<float>& tiny : {GeVector3<float>(0, 0, 0), GeVector3<float>(-0.0f, 0, -0.0f), GeVector3<float>(1e-30f, -1e-30f, 1e-30f)})
+    for (const GeVector3<float>& tiny :
+         {GeVector3<float>(0, 0, 0), GeVector3<float>(-0.0f, 0, -0.0f), GeVector3<float>(1e-30f, -1e-30f, 1e-30f)})
         EXPECT_EQ(RsShadingContext::normalizeOrZero(tiny), GeVector3<float>(0.0f, 0.0f, 0.0f));
 }
 
@@ -58,12 +59,14 @@ TEST(RsShadingContext, ViewVectorPointsFromTheSurfaceToTheEye) {
     RsShadingContext context;
     for (int i = 0; i < 1000; ++i) {
         context._eyeCoord = GePoint3<float>(coordinate(rng), coordinate(rng), coordinate(rng));
-        expectNear(context.computeViewVector(), unit(V(-context._eyeCoord.x, -context._eyeCoord.y, -context._eyeCoord.z)), 4e-7, "perspective");
+        expectNear(context.computeViewVector(),
+                   unit(V(-context._eyeCoord.x, -context._eyeCoord.y, -context._eyeCoord.z)), 4e-7, "perspective");
     }
     context._eyeCoord = GePoint3<float>(0.0f, 0.0f, 0.0f);
     EXPECT_EQ(context.computeViewVector(), GeVector3<float>(0.0f, 0.0f, 0.0f));
     context._orthographic = true;
-    for (const GeVector3<float>& direction : {GeVector3<float>(0, 0, -1), GeVector3<float>(0.6f, 0, -0.8f), GeVector3<float>(0, 2, -2)}) {
+    for (const GeVector3<float>& direction :
+         {GeVector3<float>(0, 0, -1), GeVector3<float>(0.6f, 0, -0.8f), GeVector3<float>(0, 2, -2)}) {
         context._viewDirection = direction;
         for (int i = 0; i < 20; ++i) {
             context._eyeCoord = GePoint3<float>(coordinate(rng), coordinate(rng), coordinate(rng));
@@ -86,7 +89,8 @@ RsShadingContext canonicalFrame() {
 TEST(RsShadingContext, BumpMapOfNegligibleWeightLeavesTheNormalAndSamplesNothing) {
     const float smallest = std::numeric_limits<float>::min(), denormal = std::numeric_limits<float>::denorm_min();
     const ConstantSampler sampler(CoRgbaColorTyped<float>(1.0f, 0.0f, 0.3f, 1.0f));
-    for (float weight : {0.0f, -0.0f, denormal, -denormal, smallest, -smallest, std::numeric_limits<float>::quiet_NaN()}) {
+    for (float weight :
+         {0.0f, -0.0f, denormal, -denormal, smallest, -smallest, std::numeric_limits<float>::quiet_NaN()}) {
         RsShadingContext context = canonicalFrame();
         context._normal = GeVector3<float>(0.0f, 0.6f, 0.8f);
         context._tangent = GeVector3<float>(5.0f, 5.0f, 5.0f);
@@ -119,7 +123,8 @@ TEST(RsShadingContext, BumpMapTurnsTheNormalInTheTangentFrame) {
         context._texCoordDerivatives = GeLinearMatrix2<double>(0.01, 0.02, -0.03, 0.04);
         const ConstantSampler sampler(sample);
         context.applyBumpMap(sampler, weight);
-        expectNear(context._normal, normal, 2e-7, "weight " + std::to_string(weight) + " red " + std::to_string(sample.r));
+        expectNear(context._normal, normal, 2e-7,
+                   "weight " + std::to_string(weight) + " red " + std::to_string(sample.r));
         EXPECT_EQ(context._tangent, GeVector3<float>(1.0f, 0.0f, 0.0f));
         EXPECT_EQ(context._binormal, GeVector3<float>(0.0f, 1.0f, 0.0f));
         EXPECT_EQ(sampler._lastTexCoord, GePoint2<double>(0.125, -3.75));

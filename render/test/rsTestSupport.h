@@ -142,7 +142,8 @@ inline void growBoxInDouble(std::vector<GeAffineMatrix3<float>> ms, const GeAlig
         GePoint3<double> p = cornerOf(box, c);
         for (auto m = ms.rbegin(); m != ms.rend(); ++m) {
             double v[3];
-            for (int r = 0; r < 3; ++r) v[r] = (*m)(r, 0) * p.x + (*m)(r, 1) * p.y + (*m)(r, 2) * p.z + double((*m)(r, 3));
+            for (int r = 0; r < 3; ++r)
+                v[r] = (*m)(r, 0) * p.x + (*m)(r, 1) * p.y + (*m)(r, 2) * p.z + double((*m)(r, 3));
             p = {v[0], v[1], v[2]};
         }
         const double v[3] = {p.x, p.y, p.z};
@@ -168,13 +169,16 @@ struct Format {
 };
 
 inline const std::vector<Format>& allFormats() {
-    static const std::vector<Format> formats{{1, 8}, {3, 8}, {4, 8}, {1, 16}, {3, 16}, {4, 16}, {1, 32}, {3, 32}, {4, 32}};
+    static const std::vector<Format> formats{{1, 8},  {3, 8},  {4, 8},  {1, 16}, {3, 16},
+                                             {4, 16}, {1, 32}, {3, 32}, {4, 32}};
     return formats;
 }
 
 // The RGBA channel that channel c of a pixel of comps channels holds.
 inline int rgbaIndexOf(int comps, int c) { return comps == 1 ? 3 : c; }
-inline float& channelOf(Rgba& colour, int i) { return i == 0 ? colour.r : i == 1 ? colour.g : i == 2 ? colour.b : colour.a; }
+inline float& channelOf(Rgba& colour, int i) {
+    return i == 0 ? colour.r : i == 1 ? colour.g : i == 2 ? colour.b : colour.a;
+}
 inline float channelOf(const Rgba& colour, int i) { return channelOf(const_cast<Rgba&>(colour), i); }
 
 // A write guard on a new tile of zeros; the guard keeps the pixels after the tile object is gone.
@@ -342,7 +346,8 @@ inline i64 walk(i64 v, int origin, int bits) { return 2 * (v - kPixelUnit * orig
 
 // A random position in [lo, hi) pixels on the 1/256 grid.
 inline i64 randomCoord(std::mt19937& rng, double lo, double hi) {
-    return std::uniform_int_distribution<i64>(static_cast<i64>(lo * kPixelUnit), static_cast<i64>(hi * kPixelUnit) - 1)(rng);
+    return std::uniform_int_distribution<i64>(static_cast<i64>(lo * kPixelUnit),
+                                              static_cast<i64>(hi * kPixelUnit) - 1)(rng);
 }
 
 // A vertex of the given kind at p; 3D kinds get w = 1 and depth z.
@@ -395,7 +400,9 @@ public:
     i64 colEnd() const { return ceilDiv(std::max({_v[0].x, _v[1].x, _v[2].x}), kWalkUnit) + 1; }
 
 private:
-    static i64 edge(const Pt& a, const Pt& b, const Pt& p) { return (b.x - a.x) * (p.y - a.y) - (b.y - a.y) * (p.x - a.x); }
+    static i64 edge(const Pt& a, const Pt& b, const Pt& p) {
+        return (b.x - a.x) * (p.y - a.y) - (b.y - a.y) * (p.x - a.x);
+    }
     Pt _v[3];
     bool _valid;
 };
@@ -530,7 +537,9 @@ public:
 // Installs a handler on the request manager for the lifetime of the scope.
 class InterruptHandlerScope {
 public:
-    explicit InterruptHandlerScope(const RCShdPtr<PxInterruptHandler>& h) { PxRequestMgr::getInstance()->setInterruptHandler(h); }
+    explicit InterruptHandlerScope(const RCShdPtr<PxInterruptHandler>& h) {
+        PxRequestMgr::getInstance()->setInterruptHandler(h);
+    }
     ~InterruptHandlerScope() { PxRequestMgr::getInstance()->setInterruptHandler(nullptr); }
     InterruptHandlerScope(const InterruptHandlerScope&) = delete;
     InterruptHandlerScope& operator=(const InterruptHandlerScope&) = delete;

@@ -19,6 +19,7 @@ namespace Zr {
 namespace {
 
 using Mode = SdMaterial::TransferMode;
+using D = double;
 
 struct Ref {  // a colour in double for the reference formulas
     double c[3];
@@ -37,7 +38,9 @@ Hsv referenceRgbToHsv(const double c[3]) {
     const double hi = std::max({c[0], c[1], c[2]}), lo = std::min({c[0], c[1], c[2]}), delta = hi - lo;
     Hsv out{0.0, hi > 0.0 ? delta / hi : 0.0, hi};
     if (delta > 0.0) {
-        const double h = hi == c[0] ? (c[1] - c[2]) / delta : hi == c[1] ? 2.0 + (c[2] - c[0]) / delta : 4.0 + (c[0] - c[1]) / delta;
+        const double h = hi == c[0]   ? (c[1] - c[2]) / delta
+                         : hi == c[1] ? 2.0 + (c[2] - c[0]) / delta
+                                      : 4.0 + (c[0] - c[1]) / delta;
         out.h = h < 0.0 ? h * 60.0 + 360.0 : h * 60.0;
     }
     return out;
@@ -69,7 +72,7 @@ double measureSat(const double c[3]) {
 double over(double sa, double da) { return sa + (1.0 - sa) * da; }
 
 // A mode whose colour channel depends on that channel alone.
-using ChannelRule = std::function<double(double s, double d, double sa, double da)>;
+using ChannelRule = std::function<double(D s, D d, D sa, D da)>;
 
 // The frame of softlight and the colour-space modes: blended colour x weighted by da, plus the
 // premultiplied destination weighted by (1 - sa) and by da again.
@@ -109,7 +112,8 @@ Ref referenceColourSpace(const Ref& src, const Ref& dst, Take hue, Take sat, Tak
                : t == Take::measureSource ? measure(src.c) : measure(d);
     };
     double x[3];
-    referenceHsvToRgb({pick(hue, &Hsv::h, nullptr), pick(sat, &Hsv::s, measureSat), pick(value, &Hsv::v, measureValue)}, x);
+    referenceHsvToRgb({pick(hue, &Hsv::h, nullptr), pick(sat, &Hsv::s, measureSat), pick(value, &Hsv::v, measureValue)},
+                      x);
     return frame(src, dst, x);
 }
 
@@ -122,8 +126,9 @@ struct ModeCase {
 std::vector<ModeCase> referenceTable() {
     auto rule = [](Mode m, ChannelRule r) {
         return ModeCase{m, false, [r](const Ref& s, const Ref& d) {
-                            Ref out{{r(s.c[0], d.c[0], s.a, d.a), r(s.c[1], d.c[1], s.a, d.a), r(s.c[2], d.c[2], s.a, d.a)},
-                                    over(s.a, d.a)};
+                            Ref out{
+                                {r(s.c[0], d.c[0], s.a, d.a), r(s.c[1], d.c[1], s.a, d.a), r(s.c[2], d.c[2], s.a, d.a)},
+                                over(s.a, d.a)};
                             return out;
                         }};
     };
@@ -131,26 +136,29 @@ std::vector<ModeCase> referenceTable() {
         return ModeCase{m, true, [=](const Ref& a, const Ref& b) { return referenceColourSpace(a, b, h, s, v); }};
     };
     const auto srcOver = [](double s, double d, double sa) { return s * sa + d * (1.0 - sa); };
-    const auto dark = [](double s, double d, double sa, double da) { return (1.0 - sa) * d + sa * s * (1.0 - da + d); };
+    const auto dark = [](D s, D d, D sa, D da) { return (1.0 - sa) * d + sa * s * (1.0 - da + d); };
     const auto light = [](double s, double d, double sa) { return d + sa * s * (1.0 - d); };
     return {
-        rule(Mode::normal, [=](double s, double d, double sa, double) { return srcOver(s, d, sa); }),
-        rule(Mode::lumapremul, [](double s, double d, double sa, double) { return s + (1.0 - sa) * d; }),
-        rule(Mode::add, [](double s, double d, double sa, double) { return d + sa * s; }),
-        rule(Mode::subtract, [](double s, double d, double sa, double da) { return d - (2.0 * da - 1.0) * sa * s; }),
+        rule(Mode::normal, [=](D s, D d, D sa, D) { return srcOver(s, d, sa); }),
+        rule(Mode::lumapremul, [](D s, D d, D sa, D) { return s + (1.0 - sa) * d; }),
+        rule(Mode::add, [](D s, D d, D sa, D) { return d + sa * s; }),
+        rule(Mode::subtract, [](D s, D d, D sa, D da) { return d - (2.0 * da - 1.0) * sa * s; }),
         rule(Mode::multiply, dark),
-        rule(Mode::spotlight, [](double s, double d, double sa, double da) { return (1.0 - sa) * d + sa * s * (1.0 - da + 2.0 * d); }),
-        rule(Mode::spotlightBlend, [](double s, double d, double sa, double da) { return d + sa * s * (1.0 - da + d); }),
-        rule(Mode::screen, [](double s, double d, double sa, double) { return d + sa * s * (1.0 - std::min(d, 1.0)); }),
-        rule(Mode::overlay, [=](double s, double d, double sa, double da) { return d < da / 2.0 ? dark(s, d, sa, da) : light(s, d, sa); }),
+        rule(Mode::spotlight, [](D s, D d, D sa, D da) { return (1.0 - sa) * d + sa * s * (1.0 - da + 2.0 * d); }),
+        rule(Mode::spotlightBlend, [](D s, D d, D sa, D da) { return d + sa * s * (1.0 - da + d); }),
+        rule(Mode::screen, [](D s, D d, D sa, D) { return d + sa * s * (1.0 - std::min(d, 1.0)); }),
+        rule(Mode::overlay, [=](D s, D d, D sa, D da) { return d < da / 2.0 ? dark(s, d, sa, da) : light(s, d, sa); }),
         {Mode::softlight, false, referenceSoftlight},
-        rule(Mode::hardlight, [=](double s, double d, double sa, double da) { return s < 0.5 ? dark(s, d, sa, da) : light(s, d, sa); }),
-        rule(Mode::darken, [=](double s, double d, double sa, double da) { return d < s * da ? d + sa * s * (1.0 - da) : srcOver(s, d, sa); }),
-        rule(Mode::lighten, [=](double s, double d, double sa, double da) { return s * da < d ? d + sa * s * (1.0 - da) : srcOver(s, d, sa); }),
-        rule(Mode::difference, [](double s, double d, double sa, double da) {
-            return s * da < d ? d - (2.0 * da - 1.0) * sa * s : (1.0 - 2.0 * sa) * d + sa * s;
-        }),
-        rule(Mode::exclusion, [](double s, double d, double sa, double) { return d + sa * s * (1.0 - 2.0 * d); }),
+        rule(Mode::hardlight, [=](D s, D d, D sa, D da) { return s < 0.5 ? dark(s, d, sa, da) : light(s, d, sa); }),
+        rule(Mode::darken,
+             [=](D s, D d, D sa, D da) { return d < s * da ? d + sa * s * (1.0 - da) : srcOver(s, d, sa); }),
+        rule(Mode::lighten,
+             [=](D s, D d, D sa, D da) { return s * da < d ? d + sa * s * (1.0 - da) : srcOver(s, d, sa); }),
+        rule(Mode::difference,
+             [](D s, D d, D sa, D da) {
+                 return s * da < d ? d - (2.0 * da - 1.0) * sa * s : (1.0 - 2.0 * sa) * d + sa * s;
+             }),
+        rule(Mode::exclusion, [](D s, D d, D sa, D) { return d + sa * s * (1.0 - 2.0 * d); }),
         hsv(Mode::hue, Take::fromSource, Take::measureDestination, Take::measureDestination),
         hsv(Mode::saturation, Take::fromDestination, Take::measureSource, Take::fromDestination),
         hsv(Mode::color, Take::fromSource, Take::fromSource, Take::measureDestination),
@@ -167,17 +175,28 @@ void expectReference(const ModeCase& m, const Rgba& src, const Rgba& dst, double
     auto near = [tolerance](double g, double w) { return std::fabs(g - w) <= tolerance * std::max(1.0, std::fabs(w)); };
     if (near(got.r, want.c[0]) && near(got.g, want.c[1]) && near(got.b, want.c[2]) && near(got.a, want.a)) return;
     if (++failures <= 5)
-        ADD_FAILURE() << "mode " << int(m.mode) << " source " << src << " destination " << dst << " gave "
-                      << got << ", expected (" << want.c[0] << ", " << want.c[1] << ", " << want.c[2] << ", " << want.a << ")";
+        ADD_FAILURE() << "mode " << int(m.mode) << " source " << src << " destination " << dst << " gave " << got
+                      << ", expected (" << want.c[0] << ", " << want.c[1] << ", " << want.c[2] << ", " << want.a << ")";
 }
 
 // Channels on a grid of values with few significant bits, so that every branch decides the same
 // in float and in double: black, white, greys, two equal channels, values above 1 and (last two)
 // a negative channel.
 TEST(RsTransferFunc, EveryModeMatchesItsFormulaOverAGridOfColours) {
-    const float grid[][3] = {{0, 0, 0}, {1, 1, 1}, {0.5f, 0.5f, 0.5f}, {2, 2, 2}, {1, 0.5f, 0}, {0.25f, 0.75f, 0.5f},
-                             {0.5f, 0, 1}, {1.5f, 0.25f, 0.75f}, {0.75f, 0.75f, 0.25f}, {0, 0.25f, 0}, {0.125f, 0.5f, 0.5f},
-                             {0.25f, 1.25f, 3}, {-0.25f, 0.5f, 1}, {0.75f, -0.5f, 0.25f}};
+    const float grid[][3] = {{0, 0, 0},
+                             {1, 1, 1},
+                             {0.5f, 0.5f, 0.5f},
+                             {2, 2, 2},
+                             {1, 0.5f, 0},
+                             {0.25f, 0.75f, 0.5f},
+                             {0.5f, 0, 1},
+                             {1.5f, 0.25f, 0.75f},
+                             {0.75f, 0.75f, 0.25f},
+                             {0, 0.25f, 0},
+                             {0.125f, 0.5f, 0.5f},
+                             {0.25f, 1.25f, 3},
+                             {-0.25f, 0.5f, 1},
+                             {0.75f, -0.5f, 0.25f}};
     const int negatives = 2, count = static_cast<int>(std::size(grid));
     for (const ModeCase& m : referenceTable()) {
         int failures = 0;
@@ -206,7 +225,8 @@ TEST(RsTransferFunc, EveryModeMatchesItsFormulaForInexactColours) {
         auto channel = [&]() { return low + unit() * 2.0f; };
         int failures = 0;
         for (int i = 0; i < 3000; ++i) {
-            const Rgba src(channel(), channel(), channel(), unit()), dst(channel(), channel(), channel(), 0.05f + unit());
+            const Rgba src(channel(), channel(), channel(), unit()),
+                dst(channel(), channel(), channel(), 0.05f + unit());
             expectReference(m, src, dst, 2e-5, failures);
             if (m.mode != Mode::screen) continue;
             Rgba got;
@@ -242,7 +262,10 @@ TEST(RsTransferFunc, DissolveDrawsOncePerCallAndPassesAllOrNothing) {
         RnNumRecUniformRng<float> twin = RsTransferFunc::_rand;
         const float threshold = twin.eval() * 0.9999f;
         // Just above or at the threshold, or an alpha that always or never passes.
-        const float sa = i % 4 == 0 ? std::nextafter(threshold, 2.0f) : i % 4 == 1 ? threshold : i % 4 == 2 ? 1.0f : 0.0f;
+        const float sa = i % 4 == 0   ? std::nextafter(threshold, 2.0f)
+                         : i % 4 == 1 ? threshold
+                         : i % 4 == 2 ? 1.0f
+                                      : 0.0f;
         const bool passes = i % 4 == 0 || i % 4 == 2;
         Rgba got(-9, -9, -9, -9);
         RsTransferFunc::dissolve(Rgba(0.7f, 1.5f, -0.25f, sa), dst, got);
@@ -258,10 +281,10 @@ TEST(RsTransferFunc, DissolveDrawsOncePerCallAndPassesAllOrNothing) {
 // result hides the destination at alpha one can be opaque.
 TEST(RsTransferFunc, TablesFollowTheModes) {
     using F = RsTransferFunc;
-    const F::Function expected[] = {&F::normal, &F::lumapremul, &F::dissolve, &F::add, &F::subtract, &F::multiply,
-                                    &F::spotlight, &F::spotlightBlend, &F::screen, &F::overlay, &F::softlight, &F::hardlight,
-                                    &F::darken, &F::lighten, &F::difference, &F::exclusion, &F::hue, &F::saturation,
-                                    &F::color, &F::luminance};
+    const F::Function expected[] = {&F::normal,    &F::lumapremul, &F::dissolve,       &F::add,     &F::subtract,
+                                    &F::multiply,  &F::spotlight,  &F::spotlightBlend, &F::screen,  &F::overlay,
+                                    &F::softlight, &F::hardlight,  &F::darken,         &F::lighten, &F::difference,
+                                    &F::exclusion, &F::hue,        &F::saturation,     &F::color,   &F::luminance};
     static_assert(std::size(expected) == SdMaterial::transferModeCount);
     for (int m = -1; m <= 25; ++m) {
         EXPECT_EQ(F::getFunction(Mode(m)), m >= 0 && m < SdMaterial::transferModeCount ? expected[m] : nullptr) << m;
