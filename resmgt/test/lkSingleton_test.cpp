@@ -1,21 +1,16 @@
-// The typed singleton through its whole life, with faults only a peer can plant, and the memory
-// singleton's aligned blocks.
+// The typed singleton through its whole life, with faults only a peer can plant.
 #include "lkSingleton.h"
 
 #include <gtest/gtest.h>
 
 #include <atomic>
-#include <cstdint>
 #include <cstdio>
-#include <cstring>
 #include <latch>
 #include <new>
-#include <set>
 #include <thread>
 #include <vector>
 
 #include "exBase.h"
-#include "osMemoryArch.h"
 
 namespace Zr {
 
@@ -144,23 +139,6 @@ TEST(LkSingletonDeathTest, ExitDestroysSingletonsInReverseOrderOfMaking) {
     GTEST_FLAG_SET(death_test_style, "threadsafe");
     EXPECT_EXIT((void)LkSingleton<OuterAtExit>::getInstance(); std::exit(0), ::testing::ExitedWithCode(0),
                 "outer destroyed, inner alive\ninner destroyed");
-}
-
-TEST(OsMemoryArch, BlocksAreAlignedToAPowerOfTwoDistinctAndUsable) {
-    OsMemoryArch* arch = OsMemoryArch::getInstance();
-    ASSERT_NE(arch, nullptr);
-    const auto alignment = static_cast<std::uintptr_t>(arch->getAlignment());
-    EXPECT_GE(alignment, 16u);  // at least a whole float RGBA colour
-    EXPECT_EQ(alignment & (alignment - 1), 0u);
-    std::set<void*> blocks;
-    for (std::size_t bytes : {0u, 1u, 3u, 64u, 65u, 1000u, 1u << 20}) {
-        void* block = OsMemoryArch::allocate(bytes);
-        EXPECT_EQ(reinterpret_cast<std::uintptr_t>(block) % alignment, 0u) << bytes;
-        std::memset(block, 0x5a, bytes);  // the sanitizer checks the whole block is ours
-        EXPECT_TRUE(blocks.insert(block).second);
-    }
-    for (void* block : blocks) OsMemoryArch::release(block);
-    OsMemoryArch::release(nullptr);
 }
 
 }  // namespace

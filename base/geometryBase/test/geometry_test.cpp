@@ -108,6 +108,8 @@ TEST(GeVector3, CrossAndDotSatisfyTheirIdentitiesAndPointsCombineAffinely) {
     EXPECT_EQ(GeVector2<double>(3, 4).length() + GeVector2<double>(1, 0).cross(GeVector2<double>(0, 1)), 6.0);
     EXPECT_EQ(GePoint2<double>(5, 7) - GePoint2<double>(1, 2), GeVector2<double>(4, 5));
     EXPECT_EQ(GePoint2<double>(1, 2) + GeVector2<double>(4, 5), GePoint2<double>(5, 7));
+    GePoint2<double> q(1, 2);
+    EXPECT_EQ((q += GeVector2<double>(4, 5)) -= GeVector2<double>(1, 3), GePoint2<double>(4, 4));
     const GePoint3<double> p(1, -2, 3);  // w 1, and projection undoes a scaling
     EXPECT_EQ((GeHomogeneousCoord3<double>(p) * 4.0).project(), p);
     // A vector of no length or of NaN cannot be normalised; a zero one is left as it was.
@@ -168,13 +170,14 @@ TEST(GeMatrix, ElementsStandColumnAfterColumnAndAPointCombinesTheColumns) {
     const float stored[16] = {1, 5, 9, 0, 2, 6, 10, 0, 3, 7, 11, 0, 4, 8, 12, 1};
     for (int i = 0; i < 16; ++i) EXPECT_EQ(a._m[i], stored[i]) << i;
     EXPECT_EQ(GeLinearMatrix3<float>(1, 2, 3, 4, 5, 6, 7, 8, 9)(0, 2) + GeLinearMatrix2<float>(1, 2, 3, 4)(0, 1), 5);
-    const GePoint3<float> p(2, -1, 3);
-    const auto expected = a.getColumn(0) * 2.0F - a.getColumn(1) + a.getColumn(2) * 3.0F + a.getTranslation();
+    const GePoint3<float> p(2, -3, 5);
+    const auto expected = a.getColumn(0) * 2.0F - a.getColumn(1) * 3.0F + a.getColumn(2) * 5.0F + a.getTranslation();
     EXPECT_EQ(a.transformPoint(p).toVector(), expected);
     EXPECT_EQ(a.transformVector(p.toVector()), expected - a.getColumn(3));
     const auto h = GeProjectiveMatrix3<float>(a).transform(GeHomogeneousCoord3<float>(p));
     EXPECT_EQ(GeHomogeneousCoord3<float>(GePoint3<float>(expected)), h);
     for (int i = 0; i < 16; ++i) EXPECT_EQ(GeProjectiveMatrix3<double>()._m[i], i % 5 == 0 ? 1.0 : 0.0) << i;
+    EXPECT_EQ(a * GeAffineMatrix3<float>(), a);
 }
 
 // Products apply the right operand first; inverses give the identity both ways; the row vector

@@ -122,6 +122,7 @@ TEST(RCStrongPtr, ConversionsSwapAndResetKeepTheCounts) {
     RCStrongPtr<CountedPlain> a = makeStrong<CountedPlain>(counts, 1), b = makeStrong<CountedPlain>(counts, 2);
     a.swap(b);
     EXPECT_EQ(a->getId() * 10 + b->getId(), 21);
+    EXPECT_TRUE(a == a && !(a == b));
     a.reset(new CountedPlain(counts, 3));
     EXPECT_EQ(counts.deleted * 10 + a->getId(), 23);
 }

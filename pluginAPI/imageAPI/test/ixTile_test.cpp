@@ -86,7 +86,7 @@ TEST(IxTile, GuardsAddressTheFilledPixelsByTheTilesOwnCoordinates) {
 
 TEST(IxTile, GuardsShareOneHoldThatKeepsThePixelsAfterTheTileIsGone) {
     EXPECT_FALSE(IxReadGuard(IxWriteGuard()).holdsTile());
-    for (const GeRectangle<int>& rect : {GeRectangle<int>{0, 0, 0, 0}, GeRectangle<int>{5, 2, 3, 1}}) {
+    for (const GeRectangle<int>& rect : {GeRectangle<int>{0, 0, 0, 3}, GeRectangle<int>{0, 3, 0, 0}, {5, 2, 3, 1}}) {
         IxTile empty({IxPixelFormat::ALPHA, IxPixelFormat::UINT8}, rect, {0, 0, 0, 0});
         const IxReadGuard full(empty);  // even a tile with no pixels gives a guard with a handle
         EXPECT_TRUE(full.holdsTile() && full._tileHandle == empty.getStorage().get() && full._rectangle == rect);
