@@ -42,7 +42,9 @@ TEST(RsFragmentPool, GrowsByWholeChunksWhenTheCurrentOneIsUsedUp) {
                 ASSERT_EQ(pool.getChunkCount(), std::size_t(i / perChunk + 1))
                     << perChunk << " per chunk, fragment " << i;
                 ASSERT_EQ(pool.getFreeFragments(), std::size_t(perChunk - 1 - i % perChunk));
-                if (i % perChunk != 0) ASSERT_EQ(f, fragments.back() + 1);
+                if (i % perChunk != 0) {
+                    ASSERT_EQ(f, fragments.back() + 1);
+                }
                 fragments.push_back(f);
             }
             EXPECT_EQ(std::set<RsFragment*>(fragments.begin(), fragments.end()).size(), fragments.size());
