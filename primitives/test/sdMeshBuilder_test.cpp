@@ -15,6 +15,24 @@ namespace {
 
 double dot(const GeVector3<float>& a, const GeVector3<double>& b) { return a.x * b.x + a.y * b.y + a.z * b.z; }
 
+// A face's normal is the normalised cross product (v1 - v0) x (v2 - v0), over random triangles.
+TEST(SdMeshBuilder, FaceNormalsAreTheNormalisedCrossProductOfTheEdges) {
+    std::mt19937 rng(42);
+    std::uniform_real_distribution<float> coord(-5.0f, 5.0f);
+    std::vector<GePoint3<float>> vertices(300);
+    std::vector<std::uint32_t> indices(300);
+    for (std::uint32_t i = 0; i < 300; ++i) {
+        const float x = coord(rng), y = coord(rng);
+        vertices[i] = GePoint3<float>(x, y, coord(rng)), indices[i] = i;
+    }
+    const RCShdPtr<SdMesh> mesh = SdMeshBuilder().setVertices(vertices).setTriangles(indices).build();
+    const auto corner = [&](unsigned int i) { return GePoint3<double>(vertices[i]); };
+    for (unsigned int f = 0; f < 100; ++f) {
+        const auto n = (corner(3 * f + 1) - corner(3 * f)).cross(corner(3 * f + 2) - corner(3 * f)).getNormalized();
+        EXPECT_NEAR(dot(mesh->getNormal(mesh->getFace(f).getFaceNormalIndex()), n), 1.0, 1e-4) << f;
+    }
+}
+
 // The corner (1, 1, 1) of a unit cube where three faces meet, each cut differently: one triangle,
 // two fanning from the corner, three. A face's normal follows its winding (counter-clockwise seen
 // from outside here); angle weighting gives the corner the diagonal whatever the cut, weighting by
