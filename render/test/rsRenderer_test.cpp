@@ -104,6 +104,10 @@ TEST(RsRenderer, LightsArePreparedOnEveryCallEvenWithoutInstances) {
             _log.push_back(_name + " setup " + std::to_string(worldToCamera(0, 3)));
         }
         void initializeMaps(const RCShdPtr<RsScene>&) override { _log.push_back(_name + " maps"); }
+        bool illuminate(const RsShadingContext&, Illumination&) const override { return false; }
+        CoRgbColorTyped<float> shadow(const RsShadingContext&) override { return {1, 1, 1}; }
+        void lockMemoryImpl() override {}
+        void unlockMemoryImpl() override {}
         std::vector<std::string>& _log;
         std::string _name;
     };
