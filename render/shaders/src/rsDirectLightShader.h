@@ -1,0 +1,47 @@
+#pragma once
+// A parallel light: it shines down the negative z axis of its instance's space, the same way at
+// every point, like a distant sun. Its falloff counts the distance from the light's plane along
+// that direction, and its shadow is one orthographic depth map a square of the light's width
+// across.
+#include "geAffineMatrix3.h"
+#include "gePoint3.h"
+#include "geScale3.h"
+#include "geVector3.h"
+#include "rsShadowMap.h"
+#include "rsStdLightShader.h"
+
+namespace Zr {
+
+class RsDirectLightShader : public RsStdLightShader {
+public:
+    // lightId is the number of the light's instance, lightToWorld its matrix. The shadow map
+    // takes its size, bias and filter range from the light, and its matrices from the light's
+    // placement and width; a null light is reported as a null pointer failure.
+    RsDirectLightShader(unsigned int lightId, const GeAffineMatrix3<float>& lightToWorld,
+                        const RCShdPtr<const SdStdLight>& light);
+    ~RsDirectLightShader() override;
+
+    // Places the light and its shadow map in the camera space of worldToCamera.
+    void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
+    // No shadow maps are rendered yet: the light stays unshadowed.
+    void initializeMaps(const RCShdPtr<RsScene>& scene) override;
+    bool illuminate(const RsShadingContext& context, Illumination& illumination) const override;
+
+    const RsShadowMap& getShadowMap() const { return _shadowMap; }
+    RsShadowMap& getShadowMap() { return _shadowMap; }
+
+protected:
+    void lockMemoryImpl() override;
+    void unlockMemoryImpl() override;
+
+    RsShadowMap _shadowMap;
+    // From the render call's camera space to the light's own space.
+    GeAffineMatrix3<float> _cameraToLight;
+    // From the light's space to the map's projection: 1 / width across, 1 along the light.
+    GeScale3<float> _scale;
+    // The light's origin in camera space, and the unit direction in which it shines.
+    GePoint3<float> _position;
+    GeVector3<float> _direction{0.0f, 0.0f, -1.0f};
+};
+
+}  // namespace Zr

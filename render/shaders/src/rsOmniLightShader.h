@@ -1,0 +1,41 @@
+#pragma once
+// A point light: it shines from the origin of its instance's space in all directions, so the
+// light's direction at a fragment is the way from the fragment to that point, and its falloff
+// counts the distance between them. Its shadow is a cube of six depth maps around the light.
+#include "geAffineMatrix3.h"
+#include "gePoint3.h"
+#include "rsCubeShadowMap.h"
+#include "rsStdLightShader.h"
+
+namespace Zr {
+
+class RsOmniLightShader : public RsStdLightShader {
+public:
+    // lightId is the number of the light's instance, lightToWorld its matrix. The cube map takes
+    // its size, bias and filter range from the light; a null light is reported as a null pointer
+    // failure.
+    RsOmniLightShader(unsigned int lightId, const GeAffineMatrix3<float>& lightToWorld,
+                      const RCShdPtr<const SdStdLight>& light);
+    ~RsOmniLightShader() override;
+
+    // Places the light in the camera space of worldToCamera.
+    void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
+    // No shadow maps are rendered yet: the light stays unshadowed.
+    void initializeMaps(const RCShdPtr<RsScene>& scene) override;
+    bool illuminate(const RsShadingContext& context, Illumination& illumination) const override;
+
+    const RsCubeShadowMap& getShadowMap() const { return _shadowMap; }
+    RsCubeShadowMap& getShadowMap() { return _shadowMap; }
+
+protected:
+    void lockMemoryImpl() override;
+    void unlockMemoryImpl() override;
+
+    RsCubeShadowMap _shadowMap;
+    // From the render call's camera space to the light's own space.
+    GeAffineMatrix3<float> _cameraToLight;
+    // The light in camera space.
+    GePoint3<float> _position;
+};
+
+}  // namespace Zr

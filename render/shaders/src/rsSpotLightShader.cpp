@@ -1,0 +1,169 @@
+#include "rsSpotLightShader.h"
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+
+#include "geLinearMatrix2.h"
+#include "gePoint2.h"
+#include "geProjectiveMatrix3.h"
+#include "nullTextureSampler.h"
+#include "rcExUtil.h"
+#include "rsShadingContext.h"
+
+namespace Zr {
+
+namespace {
+
+// The map's projection: the cone's frame in perspective from 0.001 to 100 in front of the light.
+GeProjectiveMatrix3<float> makeProjection(const GeScale3<float>& coneScale) {
+    GeProjectiveMatrix3<float> projection = coneScale.toProjective();
+    projection(2, 2) = -1.00002f;
+    projection(2, 3) = -0.00200002f;
+    projection(3, 2) = -1.0f;
+    projection(3, 3) = 0.0f;
+    return projection;
+}
+
+// The smooth step of the penumbra: 0 at t = 0, 1 at t = 1, flat at both ends.
+inline float smoothFalloff(float t) { return t * t * (3.0f - t - t); }
+
+// The change of a projected coordinate, -0.5 a / c, across one pixel step: its values at the
+// step's two ends, half a step either side of the fragment at (a, c).
+inline double projectedStep(float a, float c, float halfStepA, float halfStepC) {
+    return -0.5f * ((a + halfStepA) / (c + halfStepC) - (a - halfStepA) / (c - halfStepC));
+}
+
+}  // namespace
+
+RsSpotLightShader::RsSpotLightShader(unsigned int lightId, const GeAffineMatrix3<float>& lightToWorld,
+                                     const RCShdPtr<const SdStdLight>& light)
+    : RsStdLightShader(lightId, lightToWorld, light) {
+    if (light->_useProjectedMap) _projectedMap = light->_projectedMap;
+
+    const float outerTangent = std::tan(light->_outerConeAngle * 0.5f);
+    // The cone's width; kept away from 0 so that its reciprocal stays finite.
+    float width = light->_aspect * outerTangent;
+    const float tiny = std::numeric_limits<float>::min();
+    if (std::fabs(width) < tiny) width = width < 0.0f ? -tiny : tiny;
+    _coneScale = GeScale3<float>(1.0f / width, 1.0f / outerTangent, 1.0f);
+
+    const float innerTangent = std::tan(std::min(light->_innerConeAngle, light->_outerConeAngle) * 0.5f);
+    _penumbraStart = outerTangent > 0.0f ? innerTangent / outerTangent : 1.0f;
+    _penumbraScale = _penumbraStart < 1.0f ? 1.0f / (1.0f - _penumbraStart) : 0.0f;
+
+    _shadowMap.setSize(static_cast<float>(light->_shadowMapSize));
+    _shadowMap.setBias(light->_shadowBias);
+    _shadowMap.setRange(light->_shadowRange);
+    _shadowMap.setMatrices(_lightToWorld.computeInverse(), makeProjection(_coneScale));
+}
+
+RsSpotLightShader::~RsSpotLightShader() = default;
+
+void RsSpotLightShader::setupRender(const GeAffineMatrix3<float>& worldToCamera) {
+    _lightToCamera = worldToCamera * _lightToWorld;
+    _position = GePoint3<float>(_lightToCamera.getTranslation());
+    _cameraToLight = _lightToCamera.computeInverse();
+    _cameraToCone = _coneScale * _cameraToLight;
+    // The map's matrices lead from world space, so the map needs the way back from the camera.
+    _shadowMap.setCameraMatrix(worldToCamera.computeInverse());
+}
+
+void RsSpotLightShader::initializeMaps(const RCShdPtr<RsScene>&) {
+    if (!_light) RCExUtil::throwExNullPtr("SdStdLight");
+}
+
+bool RsSpotLightShader::illuminate(const RsShadingContext& context, Illumination& illumination) const {
+    const SdStdLight& light = *_light;
+    const CoRgbColorTyped<float> black(0.0f);
+    if (light._aspect <= 0.0f) {
+        illumination._ambient = black;
+        return false;
+    }
+
+    float strength = light._intensity;
+    const GePoint3<float> p = _cameraToCone.transformPoint(context._eyeCoord);
+    // Behind the light, or at its very origin.
+    if (p.z >= 0.0f) {
+        illumination._ambient = black;
+        return false;
+    }
+
+    if (light._coneShape == SdStdLight::ConeShape::circular) {
+        const float radius2 = p.x * p.x + p.y * p.y;
+        const float depth2 = p.z * p.z;
+        if (depth2 < radius2) {
+            illumination._ambient = black;
+            return false;
+        }
+        // The fragment's place between the axis (0) and the cone's surface (1).
+        const float f = std::sqrt(radius2 / depth2);
+        if (f > _penumbraStart) strength *= smoothFalloff((1.0f - f) * _penumbraScale);
+    } else {
+        const float ax = std::fabs(p.x);
+        const float ay = std::fabs(p.y);
+        const float az = std::fabs(p.z);
+        if (ax > az || ay > az) {
+            illumination._ambient = black;
+            return false;
+        }
+        const float fx = ax / az;
+        const float fy = ay / az;
+        float t = fx <= _penumbraStart ? 1.0f : (1.0f - fx) * _penumbraScale;
+        if (fy > _penumbraStart) t *= (1.0f - fy) * _penumbraScale;
+        if (t < 1.0f) strength *= smoothFalloff(t);
+    }
+
+    const GeVector3<float> toLight = _position - context._eyeCoord;
+    const float distance = toLight.length();
+    if (distance != 0.0f) illumination._direction = toLight / distance;
+    if (!applyDecay(distance, strength)) {
+        illumination._ambient = black;
+        return false;
+    }
+
+    illumination._ambient = light._color * strength;
+    illumination._cosine = illumination._direction.dot(context._normal);
+    if (illumination._cosine <= 0.0f) return false;
+
+    const CoRgbColorTyped<float> shadow =
+        context._receivesShadows ? evaluateShadow(context) : CoRgbColorTyped<float>(1.0f);
+    illumination._color = light._color;
+
+    if (_projectedMap && (shadow.r != 0.0f || shadow.g != 0.0f || shadow.b != 0.0f)) {
+        // The image spans the cone's square cross-section, centred on its axis.
+        const float scale = -0.5f / p.z;
+        const GePoint2<double> texCoord(p.x * scale + 0.5f, p.y * scale + 0.5f);
+        GeLinearMatrix2<double> derivatives = context._texCoordDerivatives;
+        if (_projectedMap->needsDerivatives()) {
+            const GeVector3<float> h = _cameraToCone.transformVector(context._dEyeCoord_dx * 0.5f);
+            const GeVector3<float> k = _cameraToCone.transformVector(context._dEyeCoord_dy * 0.5f);
+            derivatives._m[0] = projectedStep(p.x, p.z, h.x, h.z);
+            derivatives._m[1] = projectedStep(p.x, p.z, k.x, k.z);
+            derivatives._m[2] = projectedStep(p.y, p.z, h.y, h.z);
+            derivatives._m[3] = projectedStep(p.y, p.z, k.y, k.z);
+        }
+        const CoRgbaColorTyped<float> g = _projectedSampler->sample(texCoord, derivatives);
+        const float w = _projectedMap->getWeight();
+        // Where the light is shadowed the image fades out with it.
+        illumination._color.r *= g.r * w * shadow.r + 1.0f - shadow.r;
+        illumination._color.g *= g.g * w * shadow.g + 1.0f - shadow.g;
+        illumination._color.b *= g.b * w * shadow.b + 1.0f - shadow.b;
+    }
+
+    if (shadow.getMin() < 1.0f) applyShadowColor(illumination._color, light._shadowColor, shadow);
+    illumination._color *= strength;
+    return true;
+}
+
+void RsSpotLightShader::lockMemoryImpl() {
+    if (_projectedSampler) return;
+    if (_projectedMap) _projectedSampler = _projectedMap->createSampler();
+    if (!_projectedSampler) _projectedSampler = makeOwned<NullTextureSampler>();
+}
+
+void RsSpotLightShader::unlockMemoryImpl() {
+    if (_projectedSampler) _projectedSampler->releaseTiles();
+}
+
+}  // namespace Zr
