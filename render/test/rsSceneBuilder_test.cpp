@@ -1,0 +1,359 @@
+// From scene description to renderer scene: the registry's three separate maps, the scene builder's
+// instances, lights and cameras in list order, a shader per material per instance, derived mesh
+// data, what adds nothing, the order of initialisation and what the builder keeps afterwards.
+// The shaders come from probe builders registered for probe material and light types.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <functional>
+#include <string>
+#include <type_traits>
+#include <utility>
+#include <vector>
+
+#include "exBase.h"
+#include "rsSceneBuilder.h"
+#include "rsSceneRegistry.h"
+#include "rsTestSupport.h"
+#include "sdEx.h"
+#include "sdMeshGeometry.h"
+#include "sdStdLight.h"
+
+namespace Zr {
+namespace {
+
+using namespace RsTest;
+
+// Material and light types that only these tests register.
+struct ProbeMaterial : SdMaterial {
+    using RttiClassType = RttiGenType1<ProbeMaterial, SdMaterial>;
+    const RttiType<SdMaterial>& getType() const override { return RttiClassType::getInstance(); }
+};
+struct ProbeLight : SdLight {
+    using RttiClassType = RttiGenType1<ProbeLight, SdLight>;
+    const RttiType<SdObject>& getType() const override { return RttiClassType::getInstance(); }
+};
+// Registered with builders whose clones are null.
+struct VoidMaterial : SdMaterial {
+    using RttiClassType = RttiGenType1<VoidMaterial, SdMaterial>;
+    const RttiType<SdMaterial>& getType() const override { return RttiClassType::getInstance(); }
+};
+struct VoidLight : SdLight {
+    using RttiClassType = RttiGenType1<VoidLight, SdLight>;
+    const RttiType<SdObject>& getType() const override { return RttiClassType::getInstance(); }
+};
+
+int lightsInitialised = 0;
+
+// What a builder was given, and each initialisation: the scene, the instance, and what the scene
+// held at that moment.
+struct Probe {
+    RCShdPtr<const SdInstance> instance;
+    RCShdPtr<RsSceneBuilder> sceneBuilder;
+    int inits = 0;
+    RsScene* scene = nullptr;
+    const RsGeomInstance* served = nullptr;
+    std::size_t lightsInScene = 0;
+    int lightsInitialisedBefore = -1;
+};
+
+struct ProbeShader : RsMaterialShader {
+    ProbeShader(const RCShdPtr<const SdMaterial>& m, bool shadow) : RsMaterialShader(m), _shadow(shadow) {}
+    Rgba shade(RsShadingContext&) override { return {}; }
+    unsigned int getNeededContext() const override { return 0; }
+    void lockMemoryImpl() override {}
+    void unlockMemoryImpl() override {}
+    void initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) override {
+        ++_probe.inits;
+        _probe.scene = scene.get();
+        _probe.served = instance.get();
+        _probe.lightsInScene = scene->_lights.size();
+        _probe.lightsInitialisedBefore = lightsInitialised;
+    }
+    bool _shadow;
+    Probe _probe;
+};
+
+struct ProbeLightShader : RsLightShader {
+    ProbeLightShader(unsigned int id, const SdLight& light) : RsLightShader(id, light) {}
+    void initialize(const RCShdPtr<RsScene>& scene) override {
+        ++_probe.inits;
+        _probe.scene = scene.get();
+        ++lightsInitialised;
+    }
+    void setupRender(const GeAffineMatrix3<float>&) override {}
+    void initializeMaps(const RCShdPtr<RsScene>&) override {}
+    bool illuminate(const RsShadingContext&, Illumination&) const override { return false; }
+    CoRgbColorTyped<float> shadow(const RsShadingContext&) override { return {1, 1, 1}; }
+    void lockMemoryImpl() override {}
+    void unlockMemoryImpl() override {}
+    Probe _probe;
+};
+
+Probe& probeOf(const RCShdPtr<RsMaterialShader>& s) { return dynamic_cast<ProbeShader&>(*s)._probe; }
+Probe& probeOf(const RCShdPtr<RsLightShader>& s) { return dynamic_cast<ProbeLightShader&>(*s)._probe; }
+
+template <class Object, class Shader, bool kVoid = false, bool kShadow = false>
+struct ProbeBuilder : RsShaderBuilder<Object, Shader> {
+    RCShdPtr<RsShaderBuilder<Object, Shader>> clone() const override {
+        if (kVoid) return {};
+        return makeShared<ProbeBuilder>();
+    }
+    RCShdPtr<Shader> build(const RCShdPtr<const SdInstance>& instance, const RCShdPtr<Object>& object,
+                           const RCShdPtr<RsSceneBuilder>& sceneBuilder) override {
+        RCShdPtr<Shader> shader;
+        if constexpr (std::is_same_v<Shader, RsLightShader>)
+            shader = makeShared<ProbeLightShader>(instance->getLightNumber(), *object);
+        else
+            shader = makeShared<ProbeShader>(object, kShadow);
+        probeOf(shader) = Probe{instance, sceneBuilder};
+        return shader;
+    }
+};
+using MaterialBuilder = ProbeBuilder<const SdMaterial, RsMaterialShader>;
+using ShadowBuilder = ProbeBuilder<const SdMaterial, RsMaterialShader, false, true>;
+using LightBuilder = ProbeBuilder<const SdLight, RsLightShader>;
+
+
+class RsSceneBuilderTest : public ::testing::Test {
+protected:
+    static void SetUpTestSuite() {
+        static const bool registered = [] {
+            RsSceneRegistry& r = RsSceneRegistry::getInstance();
+            r.registerBuilder(ProbeMaterial::RttiClassType::getInstance(), makeShared<MaterialBuilder>());
+            r.registerShadowShaderBuilder(ProbeMaterial::RttiClassType::getInstance(), makeShared<ShadowBuilder>());
+            r.registerBuilder(ProbeLight::RttiClassType::getInstance(), makeShared<LightBuilder>());
+            using VoidMaterialBuilder = ProbeBuilder<const SdMaterial, RsMaterialShader, true>;
+            r.registerBuilder(VoidMaterial::RttiClassType::getInstance(), makeShared<VoidMaterialBuilder>());
+            r.registerShadowShaderBuilder(VoidMaterial::RttiClassType::getInstance(), makeShared<VoidMaterialBuilder>());
+            r.registerBuilder(VoidLight::RttiClassType::getInstance(),
+                              makeShared<ProbeBuilder<const SdLight, RsLightShader, true>>());
+            return true;
+        }();
+        (void)registered;
+    }
+    void SetUp() override { lightsInitialised = 0; }
+};
+
+using Materials = std::vector<RCShdPtr<const SdMaterial>>;
+
+RCShdPtr<SdInstance> placed(const RCShdPtr<SdObject>& object, float x = 0.0f, const Materials& materials = {}) {
+    RCShdPtr<SdInstance> instance = makeShared<SdInstance>(object, GeAffineMatrix3<float>::makeTranslation({x, 0, 0}));
+    instance->setMaterials(materials);
+    return instance;
+}
+RCShdPtr<SdInstance> geometry(const RCShdPtr<const SdMesh>& mesh, float x = 0.0f, const Materials& materials = {}) {
+    return placed(makeShared<SdMeshGeometry>(mesh), x, materials);
+}
+RCShdPtr<SdInstance> light(bool enabled, unsigned int number) {
+    RCShdPtr<ProbeLight> l = makeShared<ProbeLight>();
+    l->_enabled = enabled;
+    RCShdPtr<SdInstance> instance = placed(l);
+    instance->setLightNumber(number);
+    return instance;
+}
+RCShdPtr<const SdMesh> cube() { return makeBoxMesh({0, 0, 0}, {1, 1, 1}); }
+
+// Geometry at x = 0, 1, 2 with materials [a, b, a], [a] and none; a camera; lights 5, 6 (off), 7.
+struct ProbeScene {
+    RCShdPtr<const SdMaterial> a = makeShared<ProbeMaterial>(), b = makeShared<ProbeMaterial>();
+    RCShdPtr<SdScene> scene = makeShared<SdScene>();
+    ProbeScene() {
+        scene->addGeometry(geometry(cube(), 0, {a, b, a}));
+        scene->addGeometry(geometry(cube(), 1, {a}));
+        scene->addGeometry(geometry(cube(), 2));
+        scene->getGeometry()[0]->setLightTable({3, 1, 3});
+        scene->getGeometry()[0]->getAttributes()._renderOrder = 9;
+        scene->addCamera(placed(makeShared<SdCamera>()));
+        for (auto [on, number] : {std::pair{true, 5u}, std::pair{false, 6u}, std::pair{true, 7u}}) scene->addLight(light(on, number));
+    }
+};
+
+TEST_F(RsSceneBuilderTest, RegistryKeepsMaterialAndShadowBuildersApart) {
+    RsSceneRegistry registry;
+    const RttiType<SdMaterial>& base = SdMaterial::RttiClassType::getInstance();
+    registry.registerBuilder(base, makeShared<MaterialBuilder>());
+    registry.registerShadowShaderBuilder(base, makeShared<ShadowBuilder>());
+    const RCShdPtr<const SdInstance> none;
+    const RCShdPtr<const SdMaterial> m = makeShared<ProbeMaterial>();
+    auto shadowFlag = [&](const RCShdPtr<RsMaterialShaderBuilder>& builder) {
+        return dynamic_cast<ProbeShader&>(*builder->build(none, m, nullptr))._shadow;
+    };
+    EXPECT_FALSE(shadowFlag(registry.getMaterialShaderBuilder(m->getType())));
+    EXPECT_TRUE(shadowFlag(registry.getShadowShaderBuilder(m->getType())));
+}
+
+TEST_F(RsSceneBuilderTest, RegistryResolvesALightOnlyAlongItsOwnAncestry) {
+    RsSceneRegistry registry;
+    registry.registerBuilder(SdStdLight::RttiClassType::getInstance(), makeShared<LightBuilder>());
+    EXPECT_FALSE(registry.getLightShaderBuilder(SdStdLight().getType()).isNull());
+    EXPECT_THROW(registry.getLightShaderBuilder(ProbeLight().getType()), SdEx::ExCantResolveBuilder);
+}
+
+TEST_F(RsSceneBuilderTest, AddSceneMakesAShaderPerMaterialPerInstanceInListOrder) {
+    ProbeScene p;
+    RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
+    builder->addScene(p.scene);
+    const RsScene::GeomInstanceList instances = builder->getGeomInstances();
+    ASSERT_EQ(instances.size(), 3u);
+    const std::vector<Materials> expected = {{p.a, p.b, p.a}, {p.a}, {}};
+    std::vector<const RsMaterialShader*> seen;
+    for (std::size_t i = 0; i < 3; ++i) {
+        const RsGeomInstance& g = *instances[i];
+        EXPECT_EQ(g._matrix.getTranslation().x, float(i));
+        ASSERT_EQ(g._materials.size(), expected[i].size());
+        ASSERT_EQ(g._shadowMaterials.size(), expected[i].size());
+        for (std::size_t k = 0; k < expected[i].size(); ++k) {
+            for (const auto& [shader, shadow] : {std::pair{g._materials[k], false}, std::pair{g._shadowMaterials[k], true}}) {
+                EXPECT_EQ(shader->getMaterial(), expected[i][k]);
+                EXPECT_EQ(dynamic_cast<ProbeShader&>(*shader)._shadow, shadow);
+                EXPECT_EQ(probeOf(shader).instance, p.scene->getGeometry()[i]);
+                EXPECT_EQ(probeOf(shader).sceneBuilder, builder);
+                seen.push_back(shader.get());
+            }
+        }
+    }
+    std::sort(seen.begin(), seen.end());
+    EXPECT_EQ(std::unique(seen.begin(), seen.end()), seen.end()) << "a shader serves two places";
+    EXPECT_EQ(instances[0]->_renderOrder, 9);
+    EXPECT_EQ(instances[0]->_lights, (RsGeomInstance::LightSet{1, 3}));
+    ASSERT_EQ(builder->getLights().size(), 2u);
+    EXPECT_EQ(builder->getLights()[0]->_lightId, 5u);
+    EXPECT_EQ(builder->getLights()[1]->_lightId, 7u);
+    EXPECT_EQ(builder->getCameras(), (RsScene::CameraList{p.scene->getCameras()[0]}));
+}
+
+TEST_F(RsSceneBuilderTest, SceneInitialisesShadersWithAllLightsPresentThenTheLights) {
+    ProbeScene p;
+    RsSceneBuilder builder;
+    builder.addScene(p.scene);
+    const RCShdPtr<RsScene> scene = builder.createRendererScene();
+    ASSERT_EQ(scene->_geomInstances.size(), 3u);
+    ASSERT_EQ(scene->_lights.size(), 2u);
+    EXPECT_EQ(scene->_cameras.size(), 1u);
+    for (const RCShdPtr<RsGeomInstance>& g : scene->_geomInstances) {
+        for (const RCShdPtr<RsMaterialShader>& shader : g->_materials) {
+            const Probe& probe = probeOf(shader);
+            EXPECT_EQ(probe.inits, 1);
+            EXPECT_EQ(probe.scene, scene.get());
+            EXPECT_EQ(probe.served, g.get());
+            EXPECT_EQ(probe.lightsInScene, 2u);
+            EXPECT_EQ(probe.lightsInitialisedBefore, 0);
+        }
+        for (const RCShdPtr<RsMaterialShader>& shadow : g->_shadowMaterials) EXPECT_EQ(probeOf(shadow).inits, 0);
+    }
+    for (const RCShdPtr<RsLightShader>& l : scene->_lights) {
+        EXPECT_EQ(probeOf(l).inits, 1);
+        EXPECT_EQ(probeOf(l).scene, scene.get());
+    }
+}
+
+TEST_F(RsSceneBuilderTest, MakingTheSceneEmptiesTheBuilderButForItsShadowShaders) {
+    ProbeScene p;
+    RsSceneBuilder builder;
+    builder.addScene(p.scene);
+    const RsSceneBuilder::MaterialShaderList shadows = builder.getShadowShaders();
+    ASSERT_EQ(shadows.size(), 4u);
+    builder.createRendererScene();
+    EXPECT_TRUE(builder.getGeomInstances().empty() && builder.getLights().empty() && builder.getCameras().empty());
+    EXPECT_TRUE(builder.getMaterialShaders().empty());
+    EXPECT_EQ(builder.getShadowShaders(), shadows);
+    const RCShdPtr<RsScene> again = builder.createRendererScene();
+    EXPECT_TRUE(again->_geomInstances.empty() && again->_lights.empty() && again->_cameras.empty());
+}
+
+// Nothing drawable and no enabled light: no instance, shader or light, and a null answer.
+TEST_F(RsSceneBuilderTest, WhatCannotBeDrawnOrLitAddsNothing) {
+    const Materials one{makeShared<ProbeMaterial>()};
+    const RCShdPtr<const SdMesh> noFaces = SdMeshBuilder().setVertices({{0, 0, 0}}).build();
+    for (const RCShdPtr<SdInstance>& instance :
+         {geometry(nullptr, 0, one), geometry(noFaces, 0, one), light(false, 1), placed(nullptr, 0, one)}) {
+        RsSceneBuilder builder;
+        builder.add(instance);
+        const SdObject* object = instance->getObject().get();
+        if (auto g = dynamic_cast<const SdGeometry*>(object)) {
+            EXPECT_TRUE(builder.add(instance, RCShdPtr<const SdGeometry>(g)).isNull());
+        }
+        if (auto l = dynamic_cast<const SdLight*>(object)) {
+            EXPECT_TRUE(builder.add(instance, RCShdPtr<const SdLight>(l)).isNull());
+        }
+        EXPECT_TRUE(builder.getGeomInstances().empty() && builder.getLights().empty() && builder.getCameras().empty());
+        EXPECT_TRUE(builder.getMaterialShaders().empty() && builder.getShadowShaders().empty());
+    }
+}
+
+// A mesh with its derived data is shared as it is; one without gets a derived copy per instance.
+TEST_F(RsSceneBuilderTest, MeshesLackingDerivedDataGetACopyPerInstance) {
+    SdMeshBuilder meshBuilder;
+    meshBuilder.setVertices({{0, 0, 0}, {1, 0, 0}, {0, 1, 0}}).setTriangles({0, 1, 2});
+    for (const RCShdPtr<SdMesh>& mesh : {meshBuilder.build(), meshBuilder.buildWithoutDerivedData()}) {
+        const RCShdPtr<SdMeshGeometry> shape = makeShared<SdMeshGeometry>(mesh);
+        RsSceneBuilder builder;
+        const RCShdPtr<RsGeomInstance> first = builder.add(placed(shape), RCShdPtr<const SdGeometry>(shape));
+        const RCShdPtr<RsGeomInstance> second = builder.add(placed(shape), RCShdPtr<const SdGeometry>(shape));
+        EXPECT_EQ(shape->getMesh(), mesh);
+        for (const RCShdPtr<RsGeomInstance>& g : {first, second}) EXPECT_TRUE(g->_mesh->hasDerivedData());
+        if (mesh->hasDerivedData()) {
+            EXPECT_EQ(first->_mesh, mesh);
+            EXPECT_EQ(second->_mesh, mesh);
+        } else {
+            EXPECT_NE(first->_mesh, mesh);
+            EXPECT_NE(second->_mesh, first->_mesh);
+        }
+    }
+}
+
+// add(instance) sorts by the object's kind; a builder on the stack hands shader builders null.
+TEST_F(RsSceneBuilderTest, AddTakesAnInstanceByItsKind) {
+    RsSceneBuilder builder;
+    builder.add(geometry(cube()));
+    builder.add(placed(makeShared<SdCamera>()));
+    builder.add(light(true, 4));
+    EXPECT_EQ(builder.getGeomInstances().size(), 1u);
+    EXPECT_EQ(builder.getCameras().size(), 1u);
+    ASSERT_EQ(builder.getLights().size(), 1u);
+    EXPECT_TRUE(probeOf(builder.getLights()[0]).sceneBuilder.isNull());
+    try {
+        builder.add(placed(makeShared<SdMaterial>()));
+        ADD_FAILURE() << "a material placed as an object was taken";
+    } catch (const ExProgramAborted& e) {
+        EXPECT_EQ(e.getFile(), "render\\yarp\\src\\rsSceneBuilder");
+        EXPECT_EQ(e.getLine(), 132);
+    }
+    EXPECT_THROW(builder.add(RCShdPtr<const SdInstance>()), ExNullPtr);
+}
+
+TEST_F(RsSceneBuilderTest, AnObjectOfTheWrongKindInASceneListIsAFailedCast) {
+    for (int list = 0; list < 3; ++list) {
+        const RCShdPtr<SdScene> scene = makeShared<SdScene>();
+        if (list == 0) scene->addGeometry(placed(makeShared<SdCamera>()));
+        if (list == 1) scene->addCamera(light(true, 1));
+        if (list == 2) scene->addLight(geometry(cube()));
+        EXPECT_THROW(RsSceneBuilder().addScene(scene), ExCastFailed) << list;
+    }
+}
+
+TEST_F(RsSceneBuilderTest, ANullBuilderFromTheRegistryIsAnAssertion) {
+    const RCShdPtr<const SdInstance> instance = geometry(cube());
+    const RCShdPtr<const SdMaterial> material = makeShared<VoidMaterial>();
+    const RCShdPtr<const SdLight> voidLight = makeShared<VoidLight>();
+    RsSceneBuilder builder;
+    const std::vector<std::pair<int, std::function<void()>>> cases = {
+        {257, [&] { builder.add(instance, material); }},
+        {294, [&] { builder.addShadow(instance, material); }},
+        {213, [&] { builder.add(instance, voidLight); }},
+    };
+    for (const auto& [line, call] : cases) {
+        try {
+            call();
+            ADD_FAILURE() << line;
+        } catch (const ExAssertionFailed& e) {
+            EXPECT_EQ(e.getFile(), "render\\yarp\\src\\rsSceneBuilder");
+            EXPECT_EQ(e.getLine(), line);
+            EXPECT_EQ(e.getMessage(), "!builder.isNull()");
+        }
+    }
+}
+
+}  // namespace
+}  // namespace Zr
