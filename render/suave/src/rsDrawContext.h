@@ -19,6 +19,10 @@ struct RsDrawContext {
     RsTransferFunc::Function _transfer = nullptr;
     // Whether the transfer mode lets a fragment of alpha one hide everything behind it.
     bool _canBeOpaque = false;
+    // The material's needed-context mask. The span methods fill the eye position and the texture
+    // coordinates, with their derivatives, only when it asks for them: a division and a dozen
+    // products per fragment that nobody would read.
+    unsigned int _needed = ~0u;
     mutable RsShadingContext _shadingContext;
     // The material being drawn; not owned, the drawer holds it for the drawing.
     RsMaterialShader* _material = nullptr;

@@ -115,7 +115,7 @@ RsFragment* RsFZBuffer::makeFragment(const Context& context, const RsPixelData<V
     RsFragment* fragment = _pool->allocate();
     fragment->_depth = data._z._q;
     fragment->_transfer = context._transfer;
-    rsFillShadingContext(context._shadingContext, data);
+    rsFillShadingContext(context._shadingContext, data, context._needed);
     fragment->_color = context._material->shade(context._shadingContext);
     return fragment;
 }

@@ -91,6 +91,7 @@ public:
         } unlock{shader};
 
         const unsigned int needed = shader.getNeededContext();
+        _context._needed = needed;
         const bool tangents = (needed & RsShadingContext::needsTangents) != 0;
         const bool normals = (needed & RsShadingContext::needsNormal) != 0;
         if (tangents) _vertices->prepareTangents();
