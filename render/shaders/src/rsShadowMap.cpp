@@ -1,0 +1,191 @@
+#include "rsShadowMap.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "rsTolerance.h"
+
+namespace Zr {
+
+namespace {
+
+const CoRgbColorTyped<float> kLit(1.0f, 1.0f, 1.0f);
+const CoRgbColorTyped<float> kShadowed(0.0f, 0.0f, 0.0f);
+
+// Where a query point falls in the map: u and v in cells, z the depth to compare with.
+struct MapPosition {
+    float u;
+    float v;
+    float z;
+};
+
+// x and y are projected to cells (divided by w, scaled by half the size, moved to the corner);
+// z, the view-space depth plus the bias, is not divided.
+inline MapPosition toMap(const GeProjectiveMatrix3<float>& matrix, float halfSize, float bias,
+                         const GePoint3<float>& p) {
+    const float* m = matrix._m;
+    MapPosition q;
+    q.z = m[2] * p.x + m[6] * p.y + m[10] * p.z + m[14] + bias;
+    const float k = halfSize / (m[3] * p.x + m[7] * p.y + m[11] * p.z + m[15]);
+    q.u = (m[0] * p.x + m[4] * p.y + m[8] * p.z + m[12]) * k + halfSize;
+    q.v = (m[1] * p.x + m[5] * p.y + m[9] * p.z + m[13]) * k + halfSize;
+    return q;
+}
+
+// The right and bottom ends of the filter square stop this far short of the map's edge, so that
+// their truncation is the last cell.
+constexpr float kEdgeInset = 0.001f;
+
+}  // namespace
+
+RsShadowMap::RsShadowMap() = default;
+
+RsShadowMap::~RsShadowMap() = default;
+
+RsShadowMap::RsShadowMap(RsShadowMap& other) : RsShadowEvaluator(other) { takeFrom(other); }
+
+RsShadowMap::RsShadowMap(RsShadowMap&& other) : RsShadowEvaluator(other) { takeFrom(other); }
+
+RsShadowMap& RsShadowMap::operator=(RsShadowMap& other) {
+    if (this != &other) takeFrom(other);
+    return *this;
+}
+
+RsShadowMap& RsShadowMap::operator=(RsShadowMap&& other) { return *this = other; }
+
+void RsShadowMap::takeFrom(RsShadowMap& other) {
+    _map = std::move(other._map);
+    _cameraToMap = other._cameraToMap;
+    _worldToMap = other._worldToMap;
+    _worldToShadowMap = other._worldToShadowMap;
+    _projection = other._projection;
+    _size = other._size;
+    _halfSize = other._halfSize;
+    _intSize = other._intSize;
+    _bias = other._bias;
+    _halfRange = other._halfRange;
+}
+
+CoRgbColorTyped<float> RsShadowMap::computeFastShadow(const GePoint3<float>& point) const {
+    if (!_map) return kLit;
+    const MapPosition q = toMap(_cameraToMap, _halfSize, _bias, point);
+    // Outside the map nothing casts a shadow. Written as the negation of "inside" so that a
+    // coordinate that is not a number also counts as outside.
+    if (!(q.u >= 0.0f && q.u < _size && q.v >= 0.0f && q.v < _size)) return kLit;
+    const int i = static_cast<int>(q.u);
+    const int j = static_cast<int>(q.v);
+    return static_cast<double>(q.z) > _map[j * _intSize + i] ? kLit : kShadowed;
+}
+
+CoRgbColorTyped<float> RsShadowMap::computeBestShadow(const GePoint3<float>& point) const {
+    if (!_map) return kLit;
+    const MapPosition q = toMap(_cameraToMap, _halfSize, _bias, point);
+
+    // The filter square, cut to the map.
+    const float left = std::max(0.0f, q.u - _halfRange);
+    const float top = std::max(0.0f, q.v - _halfRange);
+    float right = q.u + _halfRange;
+    if (right >= _size) right = _size - kEdgeInset;
+    float bottom = q.v + _halfRange;
+    if (bottom >= _size) bottom = _size - kEdgeInset;
+    // Wholly outside the map (or not a number): lit.
+    if (!(left <= right && top <= bottom)) return kLit;
+
+    const int i0 = static_cast<int>(left);
+    const int i1 = static_cast<int>(right);
+    const int j0 = static_cast<int>(top);
+    const int j1 = static_cast<int>(bottom);
+    const double z = q.z;
+    const double* cell = _map.get() + j0 * _intSize + i0;
+    if (i0 == i1 && j0 == j1) return z > *cell ? kLit : kShadowed;
+
+    // The part of the first and last column and row that the square covers.
+    const float fl = 1.0f - left + static_cast<float>(i0);
+    const float fr = right - static_cast<float>(i1);
+    const float ft = 1.0f - top + static_cast<float>(j0);
+    const float fb = bottom - static_cast<float>(j1);
+
+    // Lit cells add their weight; the walk goes row by row in address order.
+    float sum = 0.0f;
+    if (i0 == i1) {
+        const float wx = fl - 1.0f + fr;
+        sum += z > *cell ? ft * wx : 0.0f;
+        for (int j = j0 + 1; j < j1; ++j) {
+            cell += _intSize;
+            sum += z > *cell ? wx : 0.0f;
+        }
+        cell += _intSize;
+        sum += z > *cell ? fb * wx : 0.0f;
+    } else if (j0 == j1) {
+        const float wy = ft - 1.0f + fb;
+        sum += z > cell[0] ? fl * wy : 0.0f;
+        for (int i = 1; i < i1 - i0; ++i) sum += z > cell[i] ? wy : 0.0f;
+        sum += z > cell[i1 - i0] ? fr * wy : 0.0f;
+    } else {
+        const int last = i1 - i0;
+        const auto addRow = [&](const double* row, float first, float middle, float end) {
+            sum += z > row[0] ? first : 0.0f;
+            for (int i = 1; i < last; ++i) sum += z > row[i] ? middle : 0.0f;
+            sum += z > row[last] ? end : 0.0f;
+        };
+        addRow(cell, fl * ft, ft, fr * ft);
+        for (int j = j0 + 1; j < j1; ++j) {
+            cell += _intSize;
+            addRow(cell, fl, 1.0f, fr);
+        }
+        cell += _intSize;
+        addRow(cell, fl * fb, fb, fr * fb);
+    }
+    const float lit = sum / ((right - left) * (bottom - top));
+    return {lit, lit, lit};
+}
+
+double* RsShadowMap::getMap() {
+    if (!_map) _map = std::make_unique_for_overwrite<double[]>(static_cast<std::size_t>(_intSize) * _intSize);
+    return _map.get();
+}
+
+void RsShadowMap::setSize(float size) {
+    if (RsTolerance::isEqual(size, _size)) return;
+    _map.reset();
+    _halfSize = 0.5f * size;
+    _size = size;
+    _intSize = static_cast<int>(size);
+}
+
+void RsShadowMap::setRange(float range) { _halfRange = range * 0.5f; }
+
+void RsShadowMap::setBias(float bias) { _bias = bias; }
+
+void RsShadowMap::setMatrices(const GeAffineMatrix3<float>& worldToShadowMap,
+                              const GeProjectiveMatrix3<float>& projection) {
+    _worldToShadowMap = worldToShadowMap;
+    _projection = projection;
+    // The map keeps view-space depth: the projection's depth row becomes the identity's, so that
+    // z passes through unchanged while x, y and w are projected.
+    GeProjectiveMatrix3<float> keepDepth = projection;
+    keepDepth._m[2] = 0.0f;
+    keepDepth._m[6] = 0.0f;
+    keepDepth._m[10] = 1.0f;
+    keepDepth._m[14] = 0.0f;
+    _worldToMap = keepDepth * worldToShadowMap;
+}
+
+void RsShadowMap::setCameraMatrix(const GeAffineMatrix3<float>& cameraToWorld) {
+    _cameraToMap = _worldToMap * cameraToWorld;
+}
+
+void RsShadowMap::dump(std::ostream& os) const {
+    os << " _map: " << static_cast<const void*>(_map.get()) << " _cameraToMap:";
+    _cameraToMap.dump(os);
+    os << " _worldToMap:";
+    _worldToMap.dump(os);
+    os << " _worldToShadowMap:";
+    _worldToShadowMap.dump(os);
+    os << " _projection:";
+    _projection.dump(os);
+    os << " _size: " << _size << " _halfSize: " << _halfSize << " _intSize: " << _intSize << " _bias: " << _bias
+       << " _halfRange: " << _halfRange;
+}
+
+}  // namespace Zr
