@@ -32,40 +32,44 @@ inline GeVector3<float> rsDirectionOf(const GePoint3<float>& v) {
 template <class Vertex>
 void rsFillShadingContext(RsShadingContext& context, const RsPixelData<Vertex>& data, unsigned int needed = ~0u) {
     using Data = RsPixelData<Vertex>;
-    const double inv = 1.0 / data._w._q;
-    const double dWdx = data._w._dq_dx;
-    const double dWdy = data._w._dq_dy;
+    // The division by the interpolated 1/w serves only the eye position and the texture
+    // coordinates.
+    if ((needed & (RsShadingContext::needsEyeCoord | RsShadingContext::needsTexCoord)) != 0) {
+        const double inv = 1.0 / data._w._q;
+        const double dWdx = data._w._dq_dx;
+        const double dWdy = data._w._dq_dy;
 
-    if constexpr (Data::kHasEyeCoord) {
-        if ((needed & RsShadingContext::needsEyeCoord) != 0) {
-            const GePoint3<float>& q = data._eyeCoord._q;
-            const GePoint3<float>& qx = data._eyeCoord._dq_dx;
-            const GePoint3<float>& qy = data._eyeCoord._dq_dy;
-            const double px = q.x * inv, py = q.y * inv, pz = q.z * inv;
-            context._eyeCoord = GePoint3<float>(static_cast<float>(px), static_cast<float>(py),
-                                                static_cast<float>(pz));
-            context._dEyeCoord_dx = GeVector3<float>(static_cast<float>((qx.x - px * dWdx) * inv),
-                                                     static_cast<float>((qx.y - py * dWdx) * inv),
-                                                     static_cast<float>((qx.z - pz * dWdx) * inv));
-            context._dEyeCoord_dy = GeVector3<float>(static_cast<float>((qy.x - px * dWdy) * inv),
-                                                     static_cast<float>((qy.y - py * dWdy) * inv),
-                                                     static_cast<float>((qy.z - pz * dWdy) * inv));
+        if constexpr (Data::kHasEyeCoord) {
+            if ((needed & RsShadingContext::needsEyeCoord) != 0) {
+                const GePoint3<float>& q = data._eyeCoord._q;
+                const GePoint3<float>& qx = data._eyeCoord._dq_dx;
+                const GePoint3<float>& qy = data._eyeCoord._dq_dy;
+                const double px = q.x * inv, py = q.y * inv, pz = q.z * inv;
+                context._eyeCoord = GePoint3<float>(static_cast<float>(px), static_cast<float>(py),
+                                                    static_cast<float>(pz));
+                context._dEyeCoord_dx = GeVector3<float>(static_cast<float>((qx.x - px * dWdx) * inv),
+                                                         static_cast<float>((qx.y - py * dWdx) * inv),
+                                                         static_cast<float>((qx.z - pz * dWdx) * inv));
+                context._dEyeCoord_dy = GeVector3<float>(static_cast<float>((qy.x - px * dWdy) * inv),
+                                                         static_cast<float>((qy.y - py * dWdy) * inv),
+                                                         static_cast<float>((qy.z - pz * dWdy) * inv));
+            }
         }
-    }
-    if constexpr (Data::kHasTexCoord) {
-        if ((needed & RsShadingContext::needsTexCoord) != 0) {
-            const GePoint2<double>& q = data._texCoord._q;
-            const GePoint2<double>& qx = data._texCoord._dq_dx;
-            const GePoint2<double>& qy = data._texCoord._dq_dy;
-            const double s = q.x * inv;
-            const double t = q.y * inv;
-            context._texCoord = GePoint2<double>(s, t);
-            // The context keeps ds/dx at (0, 0), ds/dy at (1, 0), dt/dx at (0, 1) and dt/dy at (1, 1).
-            const double dsdx = (qx.x - s * dWdx) * inv;
-            const double dsdy = (qy.x - s * dWdy) * inv;
-            const double dtdx = (qx.y - t * dWdx) * inv;
-            const double dtdy = (qy.y - t * dWdy) * inv;
-            context._texCoordDerivatives = GeLinearMatrix2<double>(dsdx, dtdx, dsdy, dtdy);
+        if constexpr (Data::kHasTexCoord) {
+            if ((needed & RsShadingContext::needsTexCoord) != 0) {
+                const GePoint2<double>& q = data._texCoord._q;
+                const GePoint2<double>& qx = data._texCoord._dq_dx;
+                const GePoint2<double>& qy = data._texCoord._dq_dy;
+                const double s = q.x * inv;
+                const double t = q.y * inv;
+                context._texCoord = GePoint2<double>(s, t);
+                // The context keeps ds/dx at (0, 0), ds/dy at (1, 0), dt/dx at (0, 1) and dt/dy at (1, 1).
+                const double dsdx = (qx.x - s * dWdx) * inv;
+                const double dsdy = (qy.x - s * dWdy) * inv;
+                const double dtdx = (qx.y - t * dWdx) * inv;
+                const double dtdy = (qy.y - t * dWdy) * inv;
+                context._texCoordDerivatives = GeLinearMatrix2<double>(dsdx, dtdx, dsdy, dtdy);
+            }
         }
     }
     if constexpr (Data::kHasNormal) context._normal = rsDirectionOf(data._normal._q);
