@@ -119,16 +119,18 @@ TEST(RsShadowMapTest, FastShadowTestsTheCellUnderTheProjectedPoint) {
     std::uniform_real_distribution<float> unit(-1.0f, 1.0f);
     int inside = 0, outside = 0;
     const auto randomMove = [&] {
-        GeAffineMatrix3<float> m = GeAffineMatrix3<float>::makeRotation({unit(rng), unit(rng), unit(rng)}, 3 * unit(rng));
+        const GeVector3<float> axis{unit(rng), unit(rng), unit(rng)};
+        GeAffineMatrix3<float> m = GeAffineMatrix3<float>::makeRotation(axis, 3 * unit(rng));
         m.setTranslation({5 * unit(rng), 5 * unit(rng), 5 * unit(rng)});
         return m;
     };
     for (int trial = 0; trial < 20; ++trial) {
         const int size = 24;
         const GeAffineMatrix3<float> light = randomMove(), camera = randomMove();
-        GeProjectiveMatrix3<float> projection = GeCameraBuilder<float>::makeFrustum(
-            -1.0f + 0.3f * unit(rng), 1.0f + 0.3f * unit(rng), -1.0f + 0.3f * unit(rng), 1.0f + 0.3f * unit(rng), 1.0f,
-            50.0f);
+        const float window[4] = {-1.0f + 0.3f * unit(rng), 1.0f + 0.3f * unit(rng), -1.0f + 0.3f * unit(rng),
+                                 1.0f + 0.3f * unit(rng)};
+        GeProjectiveMatrix3<float> projection =
+            GeCameraBuilder<float>::makeFrustum(window[0], window[1], window[2], window[3], 1.0f, 50.0f);
         for (int k : {2, 6, 10, 14}) projection._m[k] = 7 * unit(rng);
         const float bias = 0.1f * unit(rng);
         RsShadowMap map;
@@ -229,7 +231,7 @@ TEST(RsCubeShadowMapTest, TheFaceOfTheLargestCoordinateAnswers) {
     const GePoint3<double> centre(fixture.centre);
     int checked = 0;
     for (int n = 0; n < 3000; ++n) {
-        GeVector3<float> d(unit(rng), unit(rng), unit(rng));
+        GeVector3<float> d{unit(rng), unit(rng), unit(rng)};
         d = d * (reach(rng) / std::max({std::fabs(d.x), std::fabs(d.y), std::fabs(d.z)}));
         const GePoint3<float> p = worldToCamera.transformPoint(fixture.centre + d);
         const GeVector3<double> q = cameraToWorld.transformPoint(GePoint3<double>(p)) - centre;
@@ -282,7 +284,10 @@ TEST(RsShadowMapTest, CopyingMovesTheMapAndCopiesTheRest) {
     for (GePoint3<float>& p : points) p = {unit(rng), unit(rng), unit(rng)};
     const auto answers = [&](const RsShadowEvaluator& e) {
         std::vector<Rgb> a;
-        for (const GePoint3<float>& p : points) a.push_back(e.computeBestShadow(p)), a.push_back(e.computeFastShadow(p));
+        for (const GePoint3<float>& p : points) {
+            a.push_back(e.computeBestShadow(p));
+            a.push_back(e.computeFastShadow(p));
+        }
         return a;
     };
     const std::vector<Rgb> allLit(2 * points.size(), Rgb(1.0f));
