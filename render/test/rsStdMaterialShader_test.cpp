@@ -284,8 +284,8 @@ GePoint2<double> mirrorBall(const D3& d) {
     return {0.5 + 0.5 * h.x, 0.5 + 0.5 * h.y};
 }
 
-// The standard and the simple shader read the irradiance map at the normal's place on the sphere
-// map, the diffuse map at the fragment's own coordinate (restored after the irradiance lookup), the
+// The standard and the simple shader read the irradiance map at the place of the normal (after
+// the bump map, which here turns it onto the tangent) on the sphere map, the diffuse map at the fragment's own coordinate (restored after the irradiance lookup), the
 // reflection map at the mirrored view's place and the refraction map at (-T.x, T.y, 1 - T.z)
 // normalised, for T the view mirrored about the normal scaled by the index; the last lookup's
 // position stays in the context. Each lookup carries the fragment's derivatives.
@@ -302,6 +302,8 @@ TEST(RsStdMaterialShader, EnvironmentLookupsSampleAtTheirSphereMapPositions) {
         m->_diffuseMap = maps[1];
         m->_reflectionMap = maps[2];
         if (refracts) m->_refractionMap = maps[3];
+        const bool bumped = trial % 4 < 2;
+        if (bumped) m->_bumpMap = makeShared<ConstantParams>(Rgba(1.0f, 0.5f, 0.5f, 1.0f));
         RCShdPtr<RsMaterialShader> shader = simple ? RCShdPtr<RsMaterialShader>(makeShared<RsSimpleMaterialShader>(m))
                                                    : RCShdPtr<RsMaterialShader>(makeShared<RsStdMaterialShader>(m));
         // Frames away from the lookups' poles, where a position is not well defined.
@@ -309,8 +311,9 @@ TEST(RsStdMaterialShader, EnvironmentLookupsSampleAtTheirSphereMapPositions) {
         D3 n, v, r, u;
         for (bool poled = true; poled;) {
             context._normal = randomUnit(rng);
+            context._tangent = randomUnit(rng);
             context._eyeCoord = GePoint3<float>(0, 0, 0) + randomUnit(rng) * -2.5f;
-            n = toD3(context._normal), v = toD3(-context._eyeCoord.toVector()).unit();
+            n = toD3(bumped ? context._tangent : context._normal), v = toD3(-context._eyeCoord.toVector()).unit();
             r = n * (2 * v.dot(n)) - v;
             const D3 np = n * m->_refractionIndex, t = np * (2 * v.dot(np)) - v, w{-t.x, t.y, 1 - t.z};
             poled = n.z < -0.9 || r.z < -0.9 || w.dot(w) < 0.1;
