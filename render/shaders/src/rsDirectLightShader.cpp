@@ -72,6 +72,20 @@ bool RsDirectLightShader::illuminate(const RsShadingContext& context, Illuminati
     return applyShadowStep(context, illumination, strength);
 }
 
+void RsDirectLightShader::dump(std::ostream& os) const {
+    RsStdLightShader::dump(os);
+    os << " _shadowMap:";
+    _shadowMap.dump(os);
+    os << " _cameraToLight:";
+    _cameraToLight.dump(os);
+    os << " _scale:";
+    _scale.dump(os);
+    os << " _position:";
+    _position.dump(os);
+    os << " _direction:";
+    _direction.dump(os);
+}
+
 void RsDirectLightShader::lockMemoryImpl() {}
 
 void RsDirectLightShader::unlockMemoryImpl() {}

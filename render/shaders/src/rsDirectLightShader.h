@@ -3,6 +3,8 @@
 // every point, like a distant sun. Its falloff counts the distance from the light's plane along
 // that direction, and its shadow is one orthographic depth map a square of the light's width
 // across.
+#include <ostream>
+
 #include "geAffineMatrix3.h"
 #include "gePoint3.h"
 #include "geScale3.h"
@@ -29,6 +31,9 @@ public:
 
     const RsShadowMap& getShadowMap() const { return _shadowMap; }
     RsShadowMap& getShadowMap() { return _shadowMap; }
+
+    // What RsStdLightShader::dump prints, then this light's own members; for diagnostics.
+    void dump(std::ostream& os) const;
 
 protected:
     void lockMemoryImpl() override;

@@ -56,6 +56,16 @@ bool RsOmniLightShader::illuminate(const RsShadingContext& context, Illumination
     return applyShadowStep(context, illumination, strength);
 }
 
+void RsOmniLightShader::dump(std::ostream& os) const {
+    RsStdLightShader::dump(os);
+    os << " _shadowMap:";
+    _shadowMap.dump(os);
+    os << " _cameraToLight:";
+    _cameraToLight.dump(os);
+    os << " _position:";
+    _position.dump(os);
+}
+
 void RsOmniLightShader::lockMemoryImpl() {}
 
 void RsOmniLightShader::unlockMemoryImpl() {}

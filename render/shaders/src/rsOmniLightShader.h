@@ -2,6 +2,8 @@
 // A point light: it shines from the origin of its instance's space in all directions, so the
 // light's direction at a fragment is the way from the fragment to that point, and its falloff
 // counts the distance between them. Its shadow is a cube of six depth maps around the light.
+#include <ostream>
+
 #include "geAffineMatrix3.h"
 #include "gePoint3.h"
 #include "rsCubeShadowMap.h"
@@ -26,6 +28,9 @@ public:
 
     const RsCubeShadowMap& getShadowMap() const { return _shadowMap; }
     RsCubeShadowMap& getShadowMap() { return _shadowMap; }
+
+    // What RsStdLightShader::dump prints, then this light's own members; for diagnostics.
+    void dump(std::ostream& os) const;
 
 protected:
     void lockMemoryImpl() override;

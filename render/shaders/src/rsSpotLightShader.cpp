@@ -156,6 +156,26 @@ bool RsSpotLightShader::illuminate(const RsShadingContext& context, Illumination
     return true;
 }
 
+void RsSpotLightShader::dump(std::ostream& os) const {
+    RsStdLightShader::dump(os);
+    os << " _shadowMap:";
+    _shadowMap.dump(os);
+    os << " _projectedMap: " << static_cast<const void*>(_projectedMap.get());
+    os << " _projectedSampler: " << static_cast<const void*>(_projectedSampler.get());
+    os << " _lightToCamera:";
+    _lightToCamera.dump(os);
+    os << " _cameraToLight:";
+    _cameraToLight.dump(os);
+    os << " _cameraToCone:";
+    _cameraToCone.dump(os);
+    os << " _coneScale:";
+    _coneScale.dump(os);
+    os << " _position:";
+    _position.dump(os);
+    os << " _penumbraStart: " << _penumbraStart;
+    os << " _penumbraScale: " << _penumbraScale;
+}
+
 void RsSpotLightShader::lockMemoryImpl() {
     if (_projectedSampler) return;
     if (_projectedMap) _projectedSampler = _projectedMap->createSampler();

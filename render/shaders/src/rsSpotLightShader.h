@@ -7,6 +7,8 @@
 //
 // The cone's frame is the light's space scaled so that the cone's surface lies where x or y
 // equals |z| (the outer half angle becomes 45 degrees, across both the width and the height).
+#include <ostream>
+
 #include "geAffineMatrix3.h"
 #include "gePoint3.h"
 #include "geScale3.h"
@@ -37,6 +39,9 @@ public:
 
     const RsShadowMap& getShadowMap() const { return _shadowMap; }
     RsShadowMap& getShadowMap() { return _shadowMap; }
+
+    // What RsStdLightShader::dump prints, then this light's own members; for diagnostics.
+    void dump(std::ostream& os) const;
 
 protected:
     // Makes the projected image's sampler at the first lock (a NullTextureSampler when the map

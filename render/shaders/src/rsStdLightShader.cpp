@@ -78,6 +78,17 @@ bool RsStdLightShader::applyShadowStep(const RsShadingContext& context,
     return true;
 }
 
+void RsStdLightShader::dump(std::ostream& os) const {
+    os << " _lightId: " << _lightId << " _linkMode: " << static_cast<int>(_linkMode)
+       << " _emitAmbient: " << _emitAmbient << " _emitDiffuse: " << _emitDiffuse
+       << " _emitSpecular: " << _emitSpecular << " _lockCount: " << _lockCount
+       << " _light: " << static_cast<const void*>(_light.get()) << " _lightToWorld:";
+    _lightToWorld.dump(os);
+    os << " _decay:";
+    _decay.dump(os);
+    os << " _shadowEvaluator: " << static_cast<const void*>(_shadowEvaluator);
+}
+
 CoRgbColorTyped<float> RsStdLightShader::shadow(const RsShadingContext& context) {
     CoRgbColorTyped<float> passed(1.0f);
     const CoRgbColorTyped<float> factors = evaluateShadow(context);

@@ -5,6 +5,8 @@
 //
 // The shadow evaluator is whichever map the light rendered for the current call; null means that
 // the light casts no shadow, and every point counts as fully lit.
+#include <ostream>
+
 #include "coRgbColorTyped.h"
 #include "geAffineMatrix3.h"
 #include "rcShdPtr.h"
@@ -28,6 +30,9 @@ public:
     CoRgbColorTyped<float> shadow(const RsShadingContext& context) override;
 
     const RCShdPtr<const SdStdLight>& getLight() const { return _light; }
+
+    // The members of this class and of the base, under their names; for diagnostics.
+    void dump(std::ostream& os) const;
 
 protected:
     // lightId is the number of the light's instance, lightToWorld its matrix. A null light is
