@@ -8,8 +8,8 @@ namespace Zr {
 
 namespace {
 
-// The map's projection: the light's square of width across scaled to -1..1, and depth taken
-// orthographically from 0.001 to 100 in front of the light.
+// The map's projection: x and y divided by the light's width, so that the map spans twice the
+// width across, and depth taken orthographically from 0.001 to 100 in front of the light.
 GeProjectiveMatrix3<float> makeProjection(const GeScale3<float>& scale) {
     GeProjectiveMatrix3<float> projection = scale.toProjective();
     projection(2, 2) = -0.0200002f;
