@@ -1,8 +1,8 @@
 #pragma once
 // A parallel light: it shines down the negative z axis of its instance's space, the same way at
 // every point, like a distant sun. Its falloff counts the distance from the light's plane along
-// that direction, and its shadow is one orthographic depth map a square of the light's width
-// across.
+// that direction, and its shadow is one orthographic depth map, whose square reaches the light's
+// width to either side of its axis.
 #include <ostream>
 
 #include "geAffineMatrix3.h"
