@@ -62,8 +62,8 @@ public:
     bool _useProjectedMap = false;
     RCShdPtr<const SdTextureParams> _projectedMap;
 
-    // Direct lights: the side of the square, across the light's direction, that its shadow map
-    // covers.
+    // Direct lights: half the side of the square, across the light's direction, that its shadow
+    // map covers (the map reaches _width to either side of the light's axis).
     float _width = 10.0f;
 
     // Shadows are made only when both flags are non-zero: _shadowsEnabled is the user's switch,
