@@ -5,13 +5,25 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <typeinfo>
 #include <type_traits>
 #include <utility>
 #include <vector>
 
 #include "exBase.h"
+#include "rsDirectLightShader.h"
+#include "rsNoShadeMaterialShader.h"
+#include "rsOmniLightShader.h"
 #include "rsSceneBuilder.h"
 #include "rsSceneRegistry.h"
+#include "rsShadowMatteShader.h"
+#include "rsShadowShader.h"
+#include "rsSimpleMaterialShader.h"
+#include "rsSpotLightShader.h"
+#include "rsStdLightShaderBuilder.h"
+#include "rsStdMaterialShader.h"
+#include "rsStdMaterialShaderBuilder.h"
+#include "rsStdShadowShaderBuilder.h"
 #include "rsTestSupport.h"
 #include "sdEx.h"
 #include "sdMeshGeometry.h"
@@ -265,13 +277,7 @@ TEST_F(RsSceneBuilderTest, AddTakesAnInstanceByItsKind) {
     EXPECT_EQ(builder.getCameras().size(), 1u);
     ASSERT_EQ(builder.getLights().size(), 1u);
     EXPECT_TRUE(probeOf(builder.getLights()[0]).sceneBuilder.isNull());
-    try {
-        builder.add(placed(makeShared<SdMaterial>()));
-        ADD_FAILURE() << "a material placed as an object was taken";
-    } catch (const ExProgramAborted& e) {
-        EXPECT_EQ(e.getFile(), "render\\yarp\\src\\rsSceneBuilder");
-        EXPECT_EQ(e.getLine(), 132);
-    }
+    EXPECT_THROW(builder.add(placed(makeShared<SdMaterial>())), ExProgramAborted);
     EXPECT_THROW(builder.add(RCShdPtr<const SdInstance>()), ExNullPtr);
 }
 
@@ -283,6 +289,60 @@ TEST_F(RsSceneBuilderTest, AnObjectOfTheWrongKindInASceneListIsAFailedCast) {
         if (list == 2) scene->addLight(geometry(cube()));
         EXPECT_THROW(RsSceneBuilder().addScene(scene), ExCastFailed) << list;
     }
+}
+
+// The library's load fills the process's registry with the standard builders.
+TEST_F(RsSceneBuilderTest, StandardBuildersAreRegisteredAtLoad) {
+    RsSceneRegistry& registry = RsSceneRegistry::getInstance();
+    const RttiType<SdMaterial>& material = SdMaterial::RttiClassType::getInstance();
+    EXPECT_EQ(typeid(*registry.getMaterialShaderBuilder(material)), typeid(RsStdMaterialShaderBuilder));
+    EXPECT_EQ(typeid(*registry.getShadowShaderBuilder(material)), typeid(RsStdShadowShaderBuilder));
+    EXPECT_EQ(typeid(*registry.getLightShaderBuilder(SdStdLight::RttiClassType::getInstance())),
+              typeid(RsStdLightShaderBuilder));
+}
+
+TEST_F(RsSceneBuilderTest, StandardMaterialBuildersFollowTheShadingModel) {
+    const std::vector<const std::type_info*> expected = {nullptr,
+                                                         &typeid(RsNoShadeMaterialShader),
+                                                         &typeid(RsSimpleMaterialShader),
+                                                         &typeid(RsStdMaterialShader),
+                                                         &typeid(RsShadowMatteShader),
+                                                         nullptr};
+    for (int model = -1; model <= 4; ++model) {
+        RCShdPtr<SdMaterial> material = makeShared<SdMaterial>();
+        material->_shadingModel = SdMaterial::ShadingModel(model);
+        const RCShdPtr<RsMaterialShader> shadow = RsStdShadowShaderBuilder().build(nullptr, material, nullptr);
+        EXPECT_EQ(typeid(*shadow), typeid(RsShadowShader));
+        EXPECT_EQ(shadow->getMaterial(), material);
+        const RCShdPtr<RsMaterialShader> shader = RsStdMaterialShaderBuilder().build(nullptr, material, nullptr);
+        const std::type_info* want = expected[model + 1];
+        ASSERT_EQ(shader.isNull(), want == nullptr) << model;
+        if (want) {
+            EXPECT_TRUE(typeid(*shader) == *want && shader->getMaterial() == material) << model;
+        }
+    }
+}
+
+// By kind with the instance's light number; a light that is not standard, or of no known kind,
+// fails.
+TEST_F(RsSceneBuilderTest, StandardLightBuilderFollowsTheKind) {
+    const std::vector<const std::type_info*> expected = {&typeid(RsDirectLightShader), &typeid(RsOmniLightShader),
+                                                         &typeid(RsSpotLightShader)};
+    for (int kind = 0; kind <= 3; ++kind) {
+        RCShdPtr<SdStdLight> l = makeShared<SdStdLight>();
+        l->_kind = SdStdLight::Kind(kind);
+        RCShdPtr<SdInstance> instance = placed(l, 2.0f);
+        instance->setLightNumber(11 + kind);
+        if (kind == 3) {
+            EXPECT_THROW(RsStdLightShaderBuilder().build(instance, l, nullptr), ExProgramAborted);
+            continue;
+        }
+        const RCShdPtr<RsLightShader> shader = RsStdLightShaderBuilder().build(instance, l, nullptr);
+        EXPECT_EQ(typeid(*shader), *expected[kind]);
+        EXPECT_EQ(shader->_lightId, 11u + kind);
+        EXPECT_EQ(dynamic_cast<RsStdLightShader&>(*shader).getLight(), l);
+    }
+    EXPECT_THROW(RsStdLightShaderBuilder().build(light(true, 1), makeShared<ProbeLight>(), nullptr), ExAssertionFailed);
 }
 
 }  // namespace

@@ -5,6 +5,13 @@
 #include "inPackageRegistry.h"
 #include "libraryBuildInfo.h"
 #include "oPtr.h"
+#include "rsSceneRegistry.h"
+#include "rsStdLightShaderBuilder.h"
+#include "rsStdMaterialShaderBuilder.h"
+#include "rsStdShadowShaderBuilder.h"
+#include "rttiGenType.h"
+#include "sdMaterial.h"
+#include "sdStdLight.h"
 
 namespace Zr {
 
@@ -15,6 +22,16 @@ template <class... DependencyTags>
 void start(InPackageInit& package) {
     package.registerPackage();
     (package.addDependency(InInit<DependencyTags>::getType()), ...);
+}
+
+// The start of the "shaders" package: the standard builders under the types that every standard
+// light and every material derives from, so that any of them finds a shader.
+void registerStandardShaderBuilders() {
+    RsSceneRegistry& registry = RsSceneRegistry::getInstance();
+    registry.registerBuilder(RttiGenType1<SdStdLight, SdLight>::getInstance(), makeShared<RsStdLightShaderBuilder>());
+    const RttiType<SdMaterial>& material = RttiGenType0<SdMaterial, SdMaterial>::getInstance();
+    registry.registerBuilder(material, makeShared<RsStdMaterialShaderBuilder>());
+    registry.registerShadowShaderBuilder(material, makeShared<RsStdShadowShaderBuilder>());
 }
 
 // The packages of this library, made in static initialisation in this order.
@@ -32,6 +49,8 @@ struct RenderLibraryPackages {
         buildInfo = &InBuildInfoUtil::registerInfo(OPtr<InBuildInfo>(new LibraryBuildInfo));
         start<Tag::yarp, Tag::internalAPI, Tag::pluginAPI, Tag::primitives, Tag::resmgt, Tag::base>(suave);
         start<Tag::yarp, Tag::suave, Tag::primitives, Tag::resmgt, Tag::base>(shaders);
+        // Once per process, as this object is made once, and before the host can call in.
+        registerStandardShaderBuilders();
         start<Tag::primitives, Tag::resmgt, Tag::base>(yarp);
     }
 
