@@ -69,8 +69,8 @@ struct RsShaderMap {
 
     // What is seen through the surface: T = 2 (V . N') N' - V with the normal scaled by the
     // refraction index, N' = index N. T is mapped as (-T.x, T.y, 1 - T.z) divided by twice its
-    // length, about the map's centre; the y keeps its sign on purpose, so that the picture behind
-    // is seen upright. The lookup position stays in the context.
+    // length, about the map's centre: x is mirrored and y is not, on purpose. The lookup position
+    // stays in the context.
     CoRgbColorTyped<float> lookUpByRefraction(RsShadingContext& context,
                                               const GeVector3<float>& view,
                                               float refractionIndex) const {
