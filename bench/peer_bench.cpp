@@ -57,7 +57,7 @@ const std::vector<SceneCase>& sceneCases() {
     static const std::vector<SceneCase> cases = {
         {"sample scene",
          [](int width, int height) {
-             return Scene{ZrSampleScene::makeScene(), ZrSampleScene::makeCamera(width, height)};
+             return Scene{ZrSampleScene::makeUnlitScene(), ZrSampleScene::makeCamera(width, height)};
          }},
         // 224 by 224 cells of two triangles (100,352 triangles) facing the camera.
         {"100k triangles",

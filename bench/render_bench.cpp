@@ -1,4 +1,5 @@
-// Whole render calls of RsRenderer on the fragment Z-buffer path: the sample scene of zrender,
+// Whole render calls of RsRenderer on the fragment Z-buffer path: the sample scene of zrender
+// (unlit with the host's diffuse shader, and lit as zrender draws it),
 // a mesh of about 100,000 small triangles, one quad over the same picture (the grid's time minus
 // the quad's, over 100,352, is the cost of one triangle), and ten transparent layers over the
 // whole picture. Each reports megapixels and fragments (shaded surface samples) per second, and
@@ -65,13 +66,40 @@ void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const R
     state.counters["peakMiB"] = static_cast<double>(usage.ru_maxrss) / 1024.0;
 }
 
+RCShdPtr<SdInstance> sampleCamera(const benchmark::State& state) {
+    return ZrSampleScene::makeCamera(static_cast<int>(state.range(0)), static_cast<int>(state.range(1)));
+}
+
+// The sample scene's geometry, unlit, every material drawn by the host's diffuse shader.
 void BM_SampleScene(benchmark::State& state) {
     std::uint64_t fragments = 0;
-    const RCShdPtr<RsScene> scene = ZrSampleScene::makeScene(countingShaders(fragments));
-    renderLoop(state, scene, ZrSampleScene::makeCamera(static_cast<int>(state.range(0)), static_cast<int>(state.range(1))),
-               fragments);
+    const RCShdPtr<RsScene> scene = ZrSampleScene::makeUnlitScene(countingShaders(fragments));
+    renderLoop(state, scene, sampleCamera(state), fragments);
 }
 BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
+
+// The sample scene as zrender draws it: three lights and the standard material. Its fragments
+// are those of the unlit scene (the same surfaces, the same opacities), counted in one render of
+// that scene first, so that the time per fragment and light can be read.
+void BM_LitSampleScene(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    {
+        const int width = static_cast<int>(state.range(0)), height = static_cast<int>(state.range(1));
+        IxTile tile(IxPixelFormat(IxPixelFormat::RGBA, IxPixelFormat::UINT8), {0, width, 0, height}, {});
+        RsRenderer().render(sampleCamera(state), ZrSampleScene::makeUnlitScene(countingShaders(fragments)),
+                            {0, width, 0, height}, IxWriteGuard(tile));
+    }
+    const RCShdPtr<RsScene> scene = ZrSampleScene::makeScene();
+    const std::uint64_t perFrame = fragments;
+    renderLoop(state, scene, sampleCamera(state), fragments);
+    const double lights = static_cast<double>(scene->_lights.size());
+    state.counters["fragments/s"] = benchmark::Counter(static_cast<double>(perFrame) * state.iterations(),
+                                                       benchmark::Counter::kIsRate, benchmark::Counter::OneK::kIs1000);
+    state.counters["ns/fragment/light"] = benchmark::Counter(
+        static_cast<double>(perFrame) * state.iterations() * lights / 1e9,
+        benchmark::Counter::kIsRate | benchmark::Counter::kInvert);
+}
+BENCHMARK(BM_LitSampleScene)->Args({1920, 1080})->Unit(benchmark::kMillisecond);
 
 double aspectOf(const benchmark::State& state) {
     return static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));

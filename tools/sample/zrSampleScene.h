@@ -1,19 +1,30 @@
 #pragma once
-// The sample scene that zrender draws and the render benchmarks time: on a chequered ground
-// plane stand an opaque sphere, a torus half transparent in the normal mode, a cube half
-// transparent in the screen mode (it brightens what lies behind it), and a low sphere drawn as
-// yellow wires. The camera looks down at them slightly from the front.
+// The sample scene that zrender draws and the render benchmarks time: on a tiled ground plane
+// stand an opaque, glossy sphere, a torus half transparent in the normal mode (drawn by the host's
+// own material, ZrDiffuseMaterial), a cube half transparent in the screen mode (it brightens what
+// lies behind it), and a low sphere drawn as flat yellow wires. An omni light, a spot light and a
+// direct light shine on it; the camera looks down at it slightly from the front.
+//
+// The scene is a scene description, turned into the renderer's scene by RsSceneBuilder as a host
+// does it. The benchmarks that compare the renderer with another one draw the same geometry
+// without lights, each material shaded by a shader of their choice.
 #include "rcShdPtr.h"
 #include "rsScene.h"
 #include "sdInstance.h"
+#include "sdScene.h"
 #include "zrSceneKit.h"
 
 namespace Zr {
 
 class ZrSampleScene {
 public:
-    // The scene, each material shaded by a shader from shaderMaker.
-    static RCShdPtr<RsScene> makeScene(const ZrSceneKit::ShaderMaker& shaderMaker = ZrSceneKit::diffuseShaderMaker());
+    // The scene description: geometry instances with their materials, and the three lights.
+    static RCShdPtr<SdScene> makeDescription();
+    // The lit renderer scene of the description, made by RsSceneBuilder.
+    static RCShdPtr<RsScene> makeScene();
+    // The description's geometry without lights, each material shaded by a shader of shaderMaker.
+    static RCShdPtr<RsScene> makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker =
+                                                ZrSceneKit::diffuseShaderMaker());
     // The camera for a picture of width by height pixels.
     static RCShdPtr<SdInstance> makeCamera(int width, int height);
 };

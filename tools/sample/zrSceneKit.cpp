@@ -52,15 +52,19 @@ RCShdPtr<SdInstance> ZrSceneKit::makeCamera(const GePoint3<double>& eye, const G
     camera->_near = nearPlane;
     camera->_far = farPlane;
 
-    // Camera to world: the camera looks down its -z axis, so its z axis points from the target
-    // back to the eye; x is to the right of the view and y completes the frame.
+    return makeShared<SdInstance>(camera, makeLookAt(eye, target));
+}
+
+GeAffineMatrix3<float> ZrSceneKit::makeLookAt(const GePoint3<double>& eye, const GePoint3<double>& target) {
+    // The eye looks down its -z axis, so its z axis points from the target back to the eye; x is
+    // to the right of the view and y completes the frame.
     const GeVector3<double> back = (eye - target).getNormalized();
     const GeVector3<double> right = GeVector3<double>(0, 1, 0).cross(back).getNormalized();
     const GeVector3<double> up = back.cross(right);
-    const GeAffineMatrix3<double> cameraToWorld(right.x, up.x, back.x, eye.x,  //
-                                                right.y, up.y, back.y, eye.y,  //
-                                                right.z, up.z, back.z, eye.z);
-    return makeShared<SdInstance>(camera, GeAffineMatrix3<float>(cameraToWorld));
+    const GeAffineMatrix3<double> eyeToWorld(right.x, up.x, back.x, eye.x,  //
+                                             right.y, up.y, back.y, eye.y,  //
+                                             right.z, up.z, back.z, eye.z);
+    return GeAffineMatrix3<float>(eyeToWorld);
 }
 
 GeAffineMatrix3<float> ZrSceneKit::makePlacement(const GePoint3<double>& position, const GeVector3<double>& axis,

@@ -46,6 +46,11 @@ public:
     static RCShdPtr<SdInstance> makeCamera(const GePoint3<double>& eye, const GePoint3<double>& target,
                                            double fieldOfViewDegrees, double aspect, float nearPlane, float farPlane);
 
+    // The frame of an eye at eye looking at target with world +y up, as the matrix from its own
+    // space to the world: its -z axis points at the target, as cameras, spot lights and direct
+    // lights look. Computed in double precision and rounded once to float.
+    static GeAffineMatrix3<float> makeLookAt(const GePoint3<double>& eye, const GePoint3<double>& target);
+
     // A placement: scaled evenly by scale, turned by angleDegrees about axis, then moved to
     // position. Computed in double precision and rounded once to float.
     static GeAffineMatrix3<float> makePlacement(const GePoint3<double>& position, const GeVector3<double>& axis = {0, 1, 0},

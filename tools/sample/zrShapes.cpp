@@ -60,8 +60,12 @@ RCShdPtr<const SdMesh> ZrShapes::makeGrid(float size, unsigned int cells, bool c
             }
         }
     }
+    // Texture coordinates count cells, so that a repeating map covers each cell once.
+    std::vector<GePoint3<float>> texCoords;
+    for (unsigned int j = 0; j <= cells; ++j)
+        for (unsigned int i = 0; i <= cells; ++i) texCoords.push_back({float(i), float(j), 0.0f});
     SdMeshBuilder builder;
-    mesh.fill(builder);
+    mesh.fill(builder).addTextureChannel(std::move(texCoords));
     if (checker && cells > 1) {
         const unsigned int faces = 2 * cells * cells;
         const unsigned int white = 2 * ((cells * cells + 1) / 2);

@@ -16,7 +16,7 @@ public:
     // A square of side size in the plane y = 0, normal +y, cut into cells by cells squares of two
     // triangles each. With checker, the faces form two face groups, the "white" cells first and
     // then the "black" ones, so an instance with two materials shows a chess board; without, one
-    // group of all faces.
+    // group of all faces. Texture coordinates run from 0 to cells along x and z.
     static RCShdPtr<const SdMesh> makeGrid(float size, unsigned int cells, bool checker);
 
     // A sphere of the given radius with slices meridians and stacks parallels (at least 3 and 2);
