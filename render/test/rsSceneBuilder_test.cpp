@@ -48,7 +48,7 @@ int lightsInitialised = 0;
 // What a shader's builder was given, and its initialisations with what the scene held then.
 struct Probe {
     RCShdPtr<const SdInstance> instance;
-    RCShdPtr<RsSceneBuilder> sceneBuilder;
+    const RsSceneBuilder* sceneBuilder = nullptr;  // not held: the builder holds the shader
     bool isShadow = false;
     int inits = 0;
     const RsScene* scene = nullptr;
@@ -93,7 +93,7 @@ struct ProbeBuilder : RsShaderBuilder<Object, Shader> {
             shader = makeShared<ProbeLightShader>(instance->getLightNumber(), *object);
         else
             shader = makeShared<ProbeShader>(object);
-        probeOf(shader) = Probe{instance, sceneBuilder, kShadow};
+        probeOf(shader) = Probe{instance, sceneBuilder.get(), kShadow};
         return shader;
     }
 };
@@ -185,7 +185,7 @@ TEST_F(RsSceneBuilderTest, AddSceneMakesAShaderPerMaterialPerInstanceInListOrder
                 EXPECT_EQ(shader->getMaterial(), expected[i][k]);
                 EXPECT_EQ(probeOf(shader).isShadow, shader == g._shadowMaterials[k]);
                 EXPECT_EQ(probeOf(shader).instance, p.scene->getGeometry()[i]);
-                EXPECT_EQ(probeOf(shader).sceneBuilder, builder);
+                EXPECT_EQ(probeOf(shader).sceneBuilder, builder.get());
                 seen.push_back(shader.get());
             }
         }
@@ -276,7 +276,7 @@ TEST_F(RsSceneBuilderTest, AddTakesAnInstanceByItsKind) {
     EXPECT_EQ(builder.getGeomInstances().size(), 1u);
     EXPECT_EQ(builder.getCameras().size(), 1u);
     ASSERT_EQ(builder.getLights().size(), 1u);
-    EXPECT_TRUE(probeOf(builder.getLights()[0]).sceneBuilder.isNull());
+    EXPECT_EQ(probeOf(builder.getLights()[0]).sceneBuilder, nullptr);
     EXPECT_THROW(builder.add(placed(makeShared<SdMaterial>())), ExProgramAborted);
     EXPECT_THROW(builder.add(RCShdPtr<const SdInstance>()), ExNullPtr);
 }
