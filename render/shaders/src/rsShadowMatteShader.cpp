@@ -2,14 +2,10 @@
 
 #include <algorithm>
 
-#include "rsLinkedLights.h"
-
 namespace Zr {
 
 RsShadowMatteShader::RsShadowMatteShader(const RCShdPtr<const SdMaterial>& material)
     : RsMaterialShader(material), _inverted(material->_inverted), _strength(material->_shadowStrength) {}
-
-RsShadowMatteShader::~RsShadowMatteShader() = default;
 
 void RsShadowMatteShader::initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) {
     RsLinkedLights::select(scene, instance, _lights);

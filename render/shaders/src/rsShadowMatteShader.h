@@ -4,11 +4,9 @@
 // out among the lights), as an opaque grey - white where every light is unshadowed at full
 // strength, or the other way round when the material is inverted.
 #include <ostream>
-#include <vector>
 
 #include "coRgbaColorTyped.h"
-#include "rcShdPtr.h"
-#include "rsLightShader.h"
+#include "rsLinkedLights.h"
 #include "rsMaterialShader.h"
 
 namespace Zr {
@@ -16,7 +14,6 @@ namespace Zr {
 class RsShadowMatteShader : public RsMaterialShader {
 public:
     explicit RsShadowMatteShader(const RCShdPtr<const SdMaterial>& material);
-    ~RsShadowMatteShader() override;
 
     // Keeps the lights of scene whose linking includes instance, in the scene's order, and shares
     // the shadow strength out among them.
@@ -37,7 +34,7 @@ protected:
 private:
     bool _inverted;
     float _strength;
-    std::vector<RCShdPtr<RsLightShader>> _lights;
+    RsLinkedLights::LightList _lights;
 };
 
 }  // namespace Zr

@@ -9,61 +9,42 @@
 // that shade only multiplies and adds. initialize picks the scene's lights that reach the
 // instance; the shader locks them together with its own samplers.
 #include <ostream>
-#include <vector>
 
 #include "coRgbColorTyped.h"
-#include "coRgbaColorTyped.h"
-#include "rcShdPtr.h"
-#include "rsLightShader.h"
-#include "rsMaterialShader.h"
-#include "rsShaderMap.h"
+#include "rsEnvironmentShader.h"
+#include "rsLinkedLights.h"
 
 namespace Zr {
 
-class RsStdMaterialShader : public RsMaterialShader {
+class RsStdMaterialShader : public RsEnvironmentShader {
 public:
     explicit RsStdMaterialShader(const RCShdPtr<const SdMaterial>& material);
-    ~RsStdMaterialShader() override;
 
     // Keeps the lights of scene whose linking includes instance, in the scene's order.
     void initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) override;
     // Emissive + ambient + diffuse + specular of the linked lights, plus irradiance, all times the
     // diffuse map; then reflection and refraction added. Unclamped; alpha is the opacity times the
     // diffuse map's alpha. Writes the last lookup position into the context's _texCoord and the
-    // bumped normal into its _normal.
+    // bumped normal into its _normal. Needs the eye position and normal besides what the maps need.
     CoRgbaColorTyped<float> shade(RsShadingContext& context) override;
-    // Eye position and normal; texture coordinates with a diffuse map; those and the tangent
-    // frame with a bump map of non-zero weight.
-    unsigned int getNeededContext() const override;
 
     void dump(std::ostream& os) const;
 
 protected:
-    // Makes the five samplers at the first lock and locks the linked lights.
+    // Makes the samplers at the first lock and locks the linked lights.
     void lockMemoryImpl() override;
     // Lets the samplers' tiles go and unlocks the linked lights.
     void unlockMemoryImpl() override;
 
 private:
+    // The diffuse colour and the opacity are the base's _color.
     CoRgbColorTyped<float> _emissive;
     CoRgbColorTyped<float> _ambient;
-    CoRgbColorTyped<float> _diffuse;
     CoRgbColorTyped<float> _specular;
-    CoRgbColorTyped<float> _reflection;
-    CoRgbColorTyped<float> _refraction;
-    CoRgbColorTyped<float> _irradiance;
-    float _refractionIndex;
-    float _opacity;
     float _shininess;
     // 2 to the power 10 _shininess: 1 for a shininess of 0, 1024 for 1.
     float _specularExponent;
-    RsShaderMap _diffuseMap;
-    RsShaderMap _reflectionMap;
-    RsShaderMap _refractionMap;
-    RsShaderMap _irradianceMap;
-    RsShaderMap _bumpMap;
-    std::vector<RCShdPtr<RsLightShader>> _lights;
-    unsigned int _neededContext;
+    RsLinkedLights::LightList _lights;
 };
 
 }  // namespace Zr

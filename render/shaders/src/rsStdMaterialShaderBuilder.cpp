@@ -7,17 +7,7 @@
 
 namespace Zr {
 
-RsStdMaterialShaderBuilder::RsStdMaterialShaderBuilder() = default;
-
-RsStdMaterialShaderBuilder::~RsStdMaterialShaderBuilder() = default;
-
-RCShdPtr<RsMaterialShaderBuilder> RsStdMaterialShaderBuilder::clone() const {
-    return makeShared<RsStdMaterialShaderBuilder>();
-}
-
-RCShdPtr<RsMaterialShader> RsStdMaterialShaderBuilder::build(const RCShdPtr<const SdInstance>& /*instance*/,
-                                                             const RCShdPtr<const SdMaterial>& material,
-                                                             const RCShdPtr<RsSceneBuilder>& /*sceneBuilder*/) {
+RCShdPtr<RsMaterialShader> RsStdMaterialShaderBuilder::makeShader(const RCShdPtr<const SdMaterial>& material) {
     switch (material->_shadingModel) {
     case SdMaterial::ShadingModel::noShade:
         return makeShared<RsNoShadeMaterialShader>(material);

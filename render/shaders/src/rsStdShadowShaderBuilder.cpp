@@ -4,17 +4,7 @@
 
 namespace Zr {
 
-RsStdShadowShaderBuilder::RsStdShadowShaderBuilder() = default;
-
-RsStdShadowShaderBuilder::~RsStdShadowShaderBuilder() = default;
-
-RCShdPtr<RsMaterialShaderBuilder> RsStdShadowShaderBuilder::clone() const {
-    return makeShared<RsStdShadowShaderBuilder>();
-}
-
-RCShdPtr<RsMaterialShader> RsStdShadowShaderBuilder::build(const RCShdPtr<const SdInstance>& /*instance*/,
-                                                           const RCShdPtr<const SdMaterial>& material,
-                                                           const RCShdPtr<RsSceneBuilder>& /*sceneBuilder*/) {
+RCShdPtr<RsMaterialShader> RsStdShadowShaderBuilder::makeShader(const RCShdPtr<const SdMaterial>& material) {
     return makeShared<RsShadowShader>(material);
 }
 

@@ -2,24 +2,14 @@
 // Makes the shadow shader of a material: the shader that the lights draw an instance with when
 // they render their shadow maps. Registered for SdMaterial in the shadow shader registry when the
 // "shaders" package starts; every material gets an RsShadowShader.
-#include "rcShdPtr.h"
-#include "rsMaterialShader.h"
-#include "rsShaderBuilder.h"
-#include "sdInstance.h"
-#include "sdMaterial.h"
+#include "rsMaterialOnlyShaderBuilder.h"
 
 namespace Zr {
 
-class RsStdShadowShaderBuilder : public RsMaterialShaderBuilder {
+class RsStdShadowShaderBuilder : public RsMaterialOnlyShaderBuilder<RsStdShadowShaderBuilder> {
 public:
-    RsStdShadowShaderBuilder();
-    ~RsStdShadowShaderBuilder() override;
-
-    RCShdPtr<RsMaterialShaderBuilder> clone() const override;
-    // An RsShadowShader of material; instance and sceneBuilder are not used.
-    RCShdPtr<RsMaterialShader> build(const RCShdPtr<const SdInstance>& instance,
-                                     const RCShdPtr<const SdMaterial>& material,
-                                     const RCShdPtr<RsSceneBuilder>& sceneBuilder) override;
+    // An RsShadowShader of material.
+    static RCShdPtr<RsMaterialShader> makeShader(const RCShdPtr<const SdMaterial>& material);
 };
 
 }  // namespace Zr
