@@ -6,15 +6,14 @@
 #include <ostream>
 
 #include "geAffineMatrix3.h"
-#include "gePoint3.h"
 #include "geScale3.h"
 #include "geVector3.h"
-#include "rsShadowMap.h"
+#include "rsSingleMapLight.h"
 #include "rsStdLightShader.h"
 
 namespace Zr {
 
-class RsDirectLightShader : public RsStdLightShader {
+class RsDirectLightShader : public RsStdLightShader, public RsSingleMapLight {
 public:
     // lightId is the number of the light's instance, lightToWorld its matrix. The shadow map
     // takes its size, bias and filter range from the light, and its matrices from the light's
@@ -23,29 +22,17 @@ public:
                         const RCShdPtr<const SdStdLight>& light);
     ~RsDirectLightShader() override;
 
-    // Places the light and its shadow map in the camera space of worldToCamera.
+    // Places the light, its direction and its shadow map in the camera space of worldToCamera.
     void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
-    // No shadow maps are rendered yet: the light stays unshadowed.
-    void initializeMaps(const RCShdPtr<RsScene>& scene) override;
     bool illuminate(const RsShadingContext& context, Illumination& illumination) const override;
-
-    const RsShadowMap& getShadowMap() const { return _shadowMap; }
-    RsShadowMap& getShadowMap() { return _shadowMap; }
 
     // What RsStdLightShader::dump prints, then this light's own members; for diagnostics.
     void dump(std::ostream& os) const;
 
 protected:
-    void lockMemoryImpl() override;
-    void unlockMemoryImpl() override;
-
-    RsShadowMap _shadowMap;
-    // From the render call's camera space to the light's own space.
-    GeAffineMatrix3<float> _cameraToLight;
     // From the light's space to the map's projection: 1 / width across, 1 along the light.
     GeScale3<float> _scale;
-    // The light's origin in camera space, and the unit direction in which it shines.
-    GePoint3<float> _position;
+    // The unit direction in which the light shines, in camera space.
     GeVector3<float> _direction{0.0f, 0.0f, -1.0f};
 };
 

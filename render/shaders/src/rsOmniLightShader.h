@@ -5,7 +5,6 @@
 #include <ostream>
 
 #include "geAffineMatrix3.h"
-#include "gePoint3.h"
 #include "rsCubeShadowMap.h"
 #include "rsStdLightShader.h"
 
@@ -20,27 +19,16 @@ public:
                       const RCShdPtr<const SdStdLight>& light);
     ~RsOmniLightShader() override;
 
-    // Places the light in the camera space of worldToCamera.
-    void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
-    // No shadow maps are rendered yet: the light stays unshadowed.
-    void initializeMaps(const RCShdPtr<RsScene>& scene) override;
     bool illuminate(const RsShadingContext& context, Illumination& illumination) const override;
 
     const RsCubeShadowMap& getShadowMap() const { return _shadowMap; }
     RsCubeShadowMap& getShadowMap() { return _shadowMap; }
 
-    // What RsStdLightShader::dump prints, then this light's own members; for diagnostics.
+    // What RsStdLightShader::dump prints, then the shadow map; for diagnostics.
     void dump(std::ostream& os) const;
 
 protected:
-    void lockMemoryImpl() override;
-    void unlockMemoryImpl() override;
-
     RsCubeShadowMap _shadowMap;
-    // From the render call's camera space to the light's own space.
-    GeAffineMatrix3<float> _cameraToLight;
-    // The light in camera space.
-    GePoint3<float> _position;
 };
 
 }  // namespace Zr

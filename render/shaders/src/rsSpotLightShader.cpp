@@ -6,24 +6,12 @@
 
 #include "geLinearMatrix2.h"
 #include "gePoint2.h"
-#include "geProjectiveMatrix3.h"
 #include "nullTextureSampler.h"
-#include "rcExUtil.h"
 #include "rsShadingContext.h"
 
 namespace Zr {
 
 namespace {
-
-// The map's projection: the cone's frame in perspective from 0.001 to 100 in front of the light.
-GeProjectiveMatrix3<float> makeProjection(const GeScale3<float>& coneScale) {
-    GeProjectiveMatrix3<float> projection = coneScale.toProjective();
-    projection(2, 2) = -1.00002f;
-    projection(2, 3) = -0.00200002f;
-    projection(3, 2) = -1.0f;
-    projection(3, 3) = 0.0f;
-    return projection;
-}
 
 // The smooth step of the penumbra: 0 at t = 0, 1 at t = 1, flat at both ends.
 inline float smoothFalloff(float t) { return t * t * (3.0f - t - t); }
@@ -52,82 +40,65 @@ RsSpotLightShader::RsSpotLightShader(unsigned int lightId, const GeAffineMatrix3
     _penumbraStart = outerTangent > 0.0f ? innerTangent / outerTangent : 1.0f;
     _penumbraScale = _penumbraStart < 1.0f ? 1.0f / (1.0f - _penumbraStart) : 0.0f;
 
-    _shadowMap.setSize(static_cast<float>(light->_shadowMapSize));
-    _shadowMap.setBias(light->_shadowBias);
-    _shadowMap.setRange(light->_shadowRange);
-    _shadowMap.setMatrices(_lightToWorld.computeInverse(), makeProjection(_coneScale));
+    // The map sees the cone's frame in perspective.
+    setUpShadowMap(_shadowMap, _coneScale, MapView::perspective);
 }
 
 RsSpotLightShader::~RsSpotLightShader() = default;
 
 void RsSpotLightShader::setupRender(const GeAffineMatrix3<float>& worldToCamera) {
-    _lightToCamera = worldToCamera * _lightToWorld;
-    _position = GePoint3<float>(_lightToCamera.getTranslation());
-    _cameraToLight = _lightToCamera.computeInverse();
+    RsStdLightShader::setupRender(worldToCamera);
     _cameraToCone = _coneScale * _cameraToLight;
-    // The map's matrices lead from world space, so the map needs the way back from the camera.
-    _shadowMap.setCameraMatrix(worldToCamera.computeInverse());
+    placeShadowMap(worldToCamera);
 }
 
-void RsSpotLightShader::initializeMaps(const RCShdPtr<RsScene>&) {
-    if (!_light) RCExUtil::throwExNullPtr("SdStdLight");
+bool RsSpotLightShader::applyCone(const GePoint3<float>& p, float& strength) const {
+    if (_light->_coneShape == SdStdLight::ConeShape::circular) {
+        const float radius2 = p.x * p.x + p.y * p.y;
+        const float depth2 = p.z * p.z;
+        if (depth2 < radius2) return false;
+        // The fragment's place between the axis (0) and the cone's surface (1).
+        const float f = std::sqrt(radius2 / depth2);
+        if (f > _penumbraStart) strength *= smoothFalloff((1.0f - f) * _penumbraScale);
+        return true;
+    }
+    const float ax = std::fabs(p.x);
+    const float ay = std::fabs(p.y);
+    const float az = std::fabs(p.z);
+    if (ax > az || ay > az) return false;
+    const float fx = ax / az;
+    const float fy = ay / az;
+    float t = fx <= _penumbraStart ? 1.0f : (1.0f - fx) * _penumbraScale;
+    if (fy > _penumbraStart) t *= (1.0f - fy) * _penumbraScale;
+    if (t < 1.0f) strength *= smoothFalloff(t);
+    return true;
 }
 
 bool RsSpotLightShader::illuminate(const RsShadingContext& context, Illumination& illumination) const {
     const SdStdLight& light = *_light;
-    const CoRgbColorTyped<float> black(0.0f);
-    if (light._aspect <= 0.0f) {
-        illumination._ambient = black;
+    // Where the light does not reach, not even its ambient term counts.
+    const auto unlit = [&illumination] {
+        illumination._ambient = CoRgbColorTyped<float>(0.0f);
         return false;
-    }
+    };
+    // A cone of no width lights nothing.
+    if (light._aspect <= 0.0f) return unlit();
 
     float strength = light._intensity;
     const GePoint3<float> p = _cameraToCone.transformPoint(context._eyeCoord);
-    // Behind the light, or at its very origin.
-    if (p.z >= 0.0f) {
-        illumination._ambient = black;
-        return false;
-    }
-
-    if (light._coneShape == SdStdLight::ConeShape::circular) {
-        const float radius2 = p.x * p.x + p.y * p.y;
-        const float depth2 = p.z * p.z;
-        if (depth2 < radius2) {
-            illumination._ambient = black;
-            return false;
-        }
-        // The fragment's place between the axis (0) and the cone's surface (1).
-        const float f = std::sqrt(radius2 / depth2);
-        if (f > _penumbraStart) strength *= smoothFalloff((1.0f - f) * _penumbraScale);
-    } else {
-        const float ax = std::fabs(p.x);
-        const float ay = std::fabs(p.y);
-        const float az = std::fabs(p.z);
-        if (ax > az || ay > az) {
-            illumination._ambient = black;
-            return false;
-        }
-        const float fx = ax / az;
-        const float fy = ay / az;
-        float t = fx <= _penumbraStart ? 1.0f : (1.0f - fx) * _penumbraScale;
-        if (fy > _penumbraStart) t *= (1.0f - fy) * _penumbraScale;
-        if (t < 1.0f) strength *= smoothFalloff(t);
-    }
+    // Behind the light, or at its very origin, or outside the cone.
+    if (p.z >= 0.0f || !applyCone(p, strength)) return unlit();
 
     const GeVector3<float> toLight = _position - context._eyeCoord;
     const float distance = toLight.length();
     if (distance != 0.0f) illumination._direction = toLight / distance;
-    if (!applyDecay(distance, strength)) {
-        illumination._ambient = black;
-        return false;
-    }
+    if (!applyDecay(distance, strength)) return unlit();
 
     illumination._ambient = light._color * strength;
     illumination._cosine = illumination._direction.dot(context._normal);
     if (illumination._cosine <= 0.0f) return false;
 
-    const CoRgbColorTyped<float> shadow =
-        context._receivesShadows ? evaluateShadow(context) : CoRgbColorTyped<float>(1.0f);
+    const CoRgbColorTyped<float> shadow = receivedShadow(context);
     illumination._color = light._color;
 
     if (_projectedMap && (shadow.r != 0.0f || shadow.g != 0.0f || shadow.b != 0.0f)) {
@@ -151,7 +122,7 @@ bool RsSpotLightShader::illuminate(const RsShadingContext& context, Illumination
         illumination._color.b *= g.b * w * shadow.b + 1.0f - shadow.b;
     }
 
-    if (shadow.getMin() < 1.0f) applyShadowColor(illumination._color, light._shadowColor, shadow);
+    applyShadow(illumination._color, shadow);
     illumination._color *= strength;
     return true;
 }
@@ -162,16 +133,10 @@ void RsSpotLightShader::dump(std::ostream& os) const {
     _shadowMap.dump(os);
     os << " _projectedMap: " << static_cast<const void*>(_projectedMap.get());
     os << " _projectedSampler: " << static_cast<const void*>(_projectedSampler.get());
-    os << " _lightToCamera:";
-    _lightToCamera.dump(os);
-    os << " _cameraToLight:";
-    _cameraToLight.dump(os);
     os << " _cameraToCone:";
     _cameraToCone.dump(os);
     os << " _coneScale:";
     _coneScale.dump(os);
-    os << " _position:";
-    _position.dump(os);
     os << " _penumbraStart: " << _penumbraStart;
     os << " _penumbraScale: " << _penumbraScale;
 }

@@ -13,14 +13,14 @@
 #include "gePoint3.h"
 #include "geScale3.h"
 #include "oPtr.h"
-#include "rsShadowMap.h"
+#include "rsSingleMapLight.h"
 #include "rsStdLightShader.h"
 #include "sdTextureParams.h"
 #include "sdTextureSampler.h"
 
 namespace Zr {
 
-class RsSpotLightShader : public RsStdLightShader {
+class RsSpotLightShader : public RsStdLightShader, public RsSingleMapLight {
 public:
     // lightId is the number of the light's instance, lightToWorld its matrix. Works out the
     // cone's scale and penumbra from the light's angles and aspect; the shadow map takes its
@@ -32,34 +32,29 @@ public:
 
     // Places the light, its cone and its shadow map in the camera space of worldToCamera.
     void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
-    // No shadow maps are rendered yet: the light stays unshadowed.
-    void initializeMaps(const RCShdPtr<RsScene>& scene) override;
     // Reads the projected image while the shader is locked; the context is left as it came.
     bool illuminate(const RsShadingContext& context, Illumination& illumination) const override;
-
-    const RsShadowMap& getShadowMap() const { return _shadowMap; }
-    RsShadowMap& getShadowMap() { return _shadowMap; }
 
     // What RsStdLightShader::dump prints, then this light's own members; for diagnostics.
     void dump(std::ostream& os) const;
 
 protected:
+    // Multiplies strength by the cone's penumbra at p, a point of the cone's frame in front of
+    // the light; false, with strength unchanged, outside the cone. A point on the cone's surface
+    // is inside, with no light left.
+    bool applyCone(const GePoint3<float>& p, float& strength) const;
+
     // Makes the projected image's sampler at the first lock (a NullTextureSampler when the map
     // hands out none); lets its cached tiles go at the last unlock.
     void lockMemoryImpl() override;
     void unlockMemoryImpl() override;
 
-    RsShadowMap _shadowMap;
     // The image projected through the cone: null unless the light uses one.
     RCShdPtr<const SdTextureParams> _projectedMap;
     OPtr<SdTextureSampler> _projectedSampler;
-    GeAffineMatrix3<float> _lightToCamera;
-    GeAffineMatrix3<float> _cameraToLight;
     // From camera space into the cone's frame: _coneScale after _cameraToLight.
     GeAffineMatrix3<float> _cameraToCone;
     GeScale3<float> _coneScale;
-    // The light's origin in camera space.
-    GePoint3<float> _position;
     // The ratio of the inner to the outer cone's opening (1 for a hard edge), and 1 over the
     // width of the penumbra in that ratio (0 for a hard edge).
     float _penumbraStart = 1.0f;

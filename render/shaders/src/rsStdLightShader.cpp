@@ -1,6 +1,10 @@
 #include "rsStdLightShader.h"
 
+#include "geProjectiveMatrix3.h"
+#include "rcExUtil.h"
+#include "rsCubeShadowMap.h"
 #include "rsShadingContext.h"
+#include "rsShadowMap.h"
 
 namespace Zr {
 
@@ -20,6 +24,14 @@ inline float mixChannel(float color, float shadowColor, float k, bool multiplies
     return color * (1.0f - k) + shadowColor * k;
 }
 
+// The settings that every kind of map takes from the light alike.
+template <class Map>
+void takeMapSettings(Map& map, const SdStdLight& light) {
+    map.setSize(static_cast<float>(light._shadowMapSize));
+    map.setBias(light._shadowBias);
+    map.setRange(light._shadowRange);
+}
+
 }  // namespace
 
 RsStdLightShader::RsStdLightShader(unsigned int lightId, const GeAffineMatrix3<float>& lightToWorld,
@@ -30,6 +42,35 @@ RsStdLightShader::RsStdLightShader(unsigned int lightId, const GeAffineMatrix3<f
       _decay(light->getDecay()) {}
 
 RsStdLightShader::~RsStdLightShader() = default;
+
+void RsStdLightShader::setupRender(const GeAffineMatrix3<float>& worldToCamera) {
+    _lightToCamera = worldToCamera * _lightToWorld;
+    _position = GePoint3<float>(_lightToCamera.getTranslation());
+    _cameraToLight = _lightToCamera.computeInverse();
+}
+
+void RsStdLightShader::initializeMaps(const RCShdPtr<RsScene>&) {
+    if (!_light) RCExUtil::throwExNullPtr("SdStdLight");
+}
+
+void RsStdLightShader::lockMemoryImpl() {}
+
+void RsStdLightShader::unlockMemoryImpl() {}
+
+void RsStdLightShader::setUpShadowMap(RsCubeShadowMap& map) const { takeMapSettings(map, *_light); }
+
+void RsStdLightShader::setUpShadowMap(RsShadowMap& map, const GeScale3<float>& scale, MapView view) const {
+    takeMapSettings(map, *_light);
+    // Only the depth part differs: a perspective divides by the distance in front of the light,
+    // a parallel view keeps w at 1.
+    GeProjectiveMatrix3<float> projection = scale.toProjective();
+    const bool perspective = view == MapView::perspective;
+    projection(2, 2) = perspective ? -1.00002f : -0.0200002f;
+    projection(2, 3) = perspective ? -0.00200002f : -1.00002f;
+    projection(3, 2) = perspective ? -1.0f : 0.0f;
+    projection(3, 3) = perspective ? 0.0f : 1.0f;
+    map.setMatrices(_lightToWorld.computeInverse(), projection);
+}
 
 bool RsStdLightShader::applyDecay(float distance, float& strength) const {
     if (_light->_decayType == SdStdLight::DecayType::none) return true;
@@ -53,29 +94,39 @@ void RsStdLightShader::applyShadowColor(CoRgbColorTyped<float>& color,
 void RsStdLightShader::applyShadowColor(CoRgbColorTyped<float>& color,
                                         const CoRgbColorTyped<float>& shadowColor,
                                         float shadow) const {
-    const float k = (1.0f - shadow) * _light->_shadowStrength;
-    const bool multiplies = _light->_shadowColorMultiplies;
-    color.r = mixChannel(color.r, shadowColor.r, k, multiplies);
-    color.g = mixChannel(color.g, shadowColor.g, k, multiplies);
-    color.b = mixChannel(color.b, shadowColor.b, k, multiplies);
+    applyShadowColor(color, shadowColor, CoRgbColorTyped<float>(shadow));
 }
 
-CoRgbColorTyped<float> RsStdLightShader::evaluateShadow(const RsShadingContext& context) const {
-    if (_shadowEvaluator == nullptr) return CoRgbColorTyped<float>(1.0f);
+void RsStdLightShader::applyShadow(CoRgbColorTyped<float>& color, const CoRgbColorTyped<float>& shadow) const {
+    if (shadow.getMin() < 1.0f) applyShadowColor(color, _light->_shadowColor, shadow);
+}
+
+CoRgbColorTyped<float> RsStdLightShader::receivedShadow(const RsShadingContext& context) const {
+    if (!context._receivesShadows || _shadowEvaluator == nullptr) return CoRgbColorTyped<float>(1.0f);
     return _shadowEvaluator->computeBestShadow(context._eyeCoord);
 }
 
-bool RsStdLightShader::applyShadowStep(const RsShadingContext& context,
-                                       Illumination& illumination, float strength) const {
+bool RsStdLightShader::illuminateFacing(const RsShadingContext& context, float facing, float distance,
+                                        Illumination& illumination) const {
     const SdStdLight& light = *_light;
-    illumination._color = light._color;
-    if (context._receivesShadows) {
-        const CoRgbColorTyped<float> factors = evaluateShadow(context);
-        // A fully lit point keeps the light's colour exactly.
-        if (factors.getMin() < 1.0f) applyShadowColor(illumination._color, light._shadowColor, factors);
+    float strength = light._intensity;
+    if (facing <= 0.0f) {
+        if (_emitAmbient)
+            illumination._ambient = applyDecay(distance, strength) ? light._color * strength : CoRgbColorTyped<float>(0.0f);
+        return false;
     }
+    if (!applyDecay(distance, strength)) return false;
+    illumination._ambient = light._color * strength;
+    illumination._color = light._color;
+    applyShadow(illumination._color, receivedShadow(context));
     illumination._color *= strength;
     return true;
+}
+
+CoRgbColorTyped<float> RsStdLightShader::shadow(const RsShadingContext& context) {
+    CoRgbColorTyped<float> passed(1.0f);
+    if (_shadowEvaluator != nullptr) applyShadow(passed, _shadowEvaluator->computeBestShadow(context._eyeCoord));
+    return passed;
 }
 
 void RsStdLightShader::dump(std::ostream& os) const {
@@ -86,14 +137,12 @@ void RsStdLightShader::dump(std::ostream& os) const {
     _lightToWorld.dump(os);
     os << " _decay:";
     _decay.dump(os);
-    os << " _shadowEvaluator: " << static_cast<const void*>(_shadowEvaluator);
-}
-
-CoRgbColorTyped<float> RsStdLightShader::shadow(const RsShadingContext& context) {
-    CoRgbColorTyped<float> passed(1.0f);
-    const CoRgbColorTyped<float> factors = evaluateShadow(context);
-    if (factors.getMin() < 1.0f) applyShadowColor(passed, _light->_shadowColor, factors);
-    return passed;
+    os << " _shadowEvaluator: " << static_cast<const void*>(_shadowEvaluator) << " _lightToCamera:";
+    _lightToCamera.dump(os);
+    os << " _cameraToLight:";
+    _cameraToLight.dump(os);
+    os << " _position:";
+    _position.dump(os);
 }
 
 }  // namespace Zr

@@ -1,7 +1,8 @@
 #pragma once
 // What the three standard lights (omni, direct, spot) share: the described light and its
-// instance's matrix, the falloff with distance, the shadow colour mixed into the light where a
-// shadow evaluator says the light is blocked, and the common ending of illuminate.
+// instance's matrix, the light's placement in the render call's camera space, the falloff with
+// distance, the set-up of the light's own shadow map, the shadow colour mixed into the light where
+// a shadow evaluator says the light is blocked, and the common ending of illuminate.
 //
 // The shadow evaluator is whichever map the light rendered for the current call; null means that
 // the light casts no shadow, and every point counts as fully lit.
@@ -9,6 +10,8 @@
 
 #include "coRgbColorTyped.h"
 #include "geAffineMatrix3.h"
+#include "gePoint3.h"
+#include "geScale3.h"
 #include "rcShdPtr.h"
 #include "rsLightShader.h"
 #include "rsShadowEvaluator.h"
@@ -17,12 +20,21 @@
 
 namespace Zr {
 
+class RsCubeShadowMap;
+class RsShadowMap;
+
 class RsStdLightShader : public RsLightShader {
 public:
     ~RsStdLightShader() override;
 
     RsStdLightShader(const RsStdLightShader&) = delete;
     RsStdLightShader& operator=(const RsStdLightShader&) = delete;
+
+    // Places the light in the camera space of worldToCamera: _lightToCamera, its inverse and the
+    // light's origin. Lights that place more call this first.
+    void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
+    // No shadow maps are rendered yet: the light stays unshadowed.
+    void initializeMaps(const RCShdPtr<RsScene>& scene) override;
 
     // The light's colour as it passes the shadows at the fragment, per channel: white where the
     // light has no shadow evaluator or nothing blocks it, moved towards the shadow colour where
@@ -35,10 +47,24 @@ public:
     void dump(std::ostream& os) const;
 
 protected:
+    // How a single depth map sees from the light: through the spot's cone, or straight along the
+    // direct light's parallel beam.
+    enum class MapView { perspective, parallel };
+
     // lightId is the number of the light's instance, lightToWorld its matrix. A null light is
     // reported as a null pointer failure.
     RsStdLightShader(unsigned int lightId, const GeAffineMatrix3<float>& lightToWorld,
                      const RCShdPtr<const SdStdLight>& light);
+
+    // Nothing to hold for omni and direct lights.
+    void lockMemoryImpl() override;
+    void unlockMemoryImpl() override;
+
+    // Gives the light's own map its size, bias and filter range from the light. A single map also
+    // takes its matrices: the light's view from world space, and a projection of x and y scaled
+    // by scale with depths from 0.001 to 100 in front of the light, in the way view says.
+    void setUpShadowMap(RsCubeShadowMap& map) const;
+    void setUpShadowMap(RsShadowMap& map, const GeScale3<float>& scale, MapView view) const;
 
     // Multiplies strength by the light's falloff at distance; false, with strength unchanged,
     // when the falloff is not positive and the light does not reach that far. A light without
@@ -52,21 +78,34 @@ protected:
     // The same with one shadow factor for all three channels.
     void applyShadowColor(CoRgbColorTyped<float>& color, const CoRgbColorTyped<float>& shadowColor,
                           float shadow) const;
+    // applyShadowColor with the light's shadow colour, only where some factor is below 1: a fully
+    // lit point keeps its colour exactly.
+    void applyShadow(CoRgbColorTyped<float>& color, const CoRgbColorTyped<float>& shadow) const;
 
-    // The common end of illuminate once the light is known to reach the fragment: the light's
-    // colour, shadowed when the fragment receives shadows, times strength into _color. Returns
-    // true.
-    bool applyShadowStep(const RsShadingContext& context, Illumination& illumination,
-                         float strength) const;
+    // The shadow factors that reach the fragment: the evaluator's where the fragment receives
+    // shadows and the light has an evaluator, white otherwise.
+    CoRgbColorTyped<float> receivedShadow(const RsShadingContext& context) const;
 
-    // The evaluator's three factors at the fragment, or white without an evaluator.
-    CoRgbColorTyped<float> evaluateShadow(const RsShadingContext& context) const;
+    // The rest of illuminate for a light whose only test is which way the fragment faces
+    // (omni, direct), once _direction and _cosine are written. facing <= 0, turned away: no
+    // direct light, but the ambient term, when the light emits one, still counts the falloff at
+    // distance (black where the light does not reach); returns false. Otherwise, where the light
+    // reaches that far: _ambient, then the shadow step (the light's colour, shadowed as the
+    // fragment receives it, times intensity and falloff into _color), and true; false with
+    // _ambient untouched where it does not reach.
+    bool illuminateFacing(const RsShadingContext& context, float facing, float distance,
+                          Illumination& illumination) const;
 
     RCShdPtr<const SdStdLight> _light;
     GeAffineMatrix3<float> _lightToWorld;
     SdLightDecay _decay;
     // Not owned: one of the light's own maps, or null for no shadow.
     const RsShadowEvaluator* _shadowEvaluator = nullptr;
+    // The light's space to the render call's camera space and back, and the light's origin in
+    // camera space; set by setupRender.
+    GeAffineMatrix3<float> _lightToCamera;
+    GeAffineMatrix3<float> _cameraToLight;
+    GePoint3<float> _position;
 };
 
 }  // namespace Zr
