@@ -129,8 +129,9 @@ RCShdPtr<RsScene> ZrSampleScene::makeScene() {
 }
 
 RCShdPtr<RsScene> ZrSampleScene::makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker) {
+    const RCShdPtr<SdScene> description = makeDescription();
     std::vector<RCShdPtr<RsGeomInstance>> instances;
-    for (const RCShdPtr<SdInstance>& instance : makeDescription()->getGeometry()) {
+    for (const RCShdPtr<SdInstance>& instance : description->getGeometry()) {
         const SdGeometry& geometry = static_cast<const SdGeometry&>(*instance->getObject());
         instances.push_back(ZrSceneKit::makeInstance(geometry.getMesh(), instance->getMaterials(),
                                                      instance->getMatrix(), shaderMaker));
