@@ -7,13 +7,6 @@
 
 namespace Zr {
 
-GeVector3<float> RsShadingContext::normalizeOrZero(const GeVector3<float>& v) {
-    const float length = std::sqrt(v.x * v.x + v.y * v.y + v.z * v.z);
-    if (length == 0.0f) return GeVector3<float>(0.0f, 0.0f, 0.0f);
-    const float inverse = 1.0f / length;
-    return GeVector3<float>(v.x * inverse, v.y * inverse, v.z * inverse);
-}
-
 GeVector3<float> RsShadingContext::computeViewVector() const {
     if (_orthographic) return -_viewDirection;
     return normalizeOrZero(-_eyeCoord.toVector());

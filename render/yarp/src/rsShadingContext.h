@@ -7,6 +7,7 @@
 // A shader receives the context by non-const reference: bump mapping replaces _normal and the
 // environment lookups write their lookup position into _texCoord. Such changes last until the
 // next fragment's fill unless the shader restores them.
+#include <cmath>
 #include <ostream>
 
 #include "coRgbColorTyped.h"
@@ -62,7 +63,13 @@ struct RsShadingContext {
 
     // The normalisation rule of the shaders: a vector of length exactly 0 stays the zero vector,
     // any other is scaled by the reciprocal of its single-precision length.
-    static GeVector3<float> normalizeOrZero(const GeVector3<float>& v);
+    // Inline: shaders call it several times per fragment.
+    static GeVector3<float> normalizeOrZero(const GeVector3<float>& v) {
+        const float length = std::sqrt(v.x * v.x + v.y * v.y + v.z * v.z);
+        if (length == 0.0f) return GeVector3<float>(0.0f, 0.0f, 0.0f);
+        const float inverse = 1.0f / length;
+        return GeVector3<float>(v.x * inverse, v.y * inverse, v.z * inverse);
+    }
 
     void dump(std::ostream& os) const;
 };
