@@ -1,13 +1,11 @@
-// The material shaders against closed forms: the standard lighting model (Lambert plus a
-// Blinn-Phong highlight per light, ambient per light, emission) at random frames and through the
-// renderer on a lit quad; the maps' weights and samples of the standard, simple and no-shade
-// shaders; the environment lookups at their sphere-map positions, seen by samplers that record
-// where they were asked; the shadow shader's transmittance; the shadow matte's shared shadow sum.
+// The standard, simple, no-shade and shadow shaders against one closed form at random frames, from
+// no more of the shading context than they ask for; the shadow matte against a table.
 #include <gtest/gtest.h>
 
 #include <cmath>
 #include <random>
 #include <string>
+#include <tuple>
 
 #include "rsNoShadeMaterialShader.h"
 #include "rsShadowMatteShader.h"
@@ -22,36 +20,22 @@ namespace {
 using namespace RsTest;
 using Rgb = CoRgbColorTyped<float>;
 using V3f = GeVector3<float>;
+using Map = RCShdPtr<const SdTextureParams>;
+using D3 = GeVector3<double>;
 
-struct D3 {
-    double x = 0, y = 0, z = 0;
-    D3 operator+(const D3& o) const { return {x + o.x, y + o.y, z + o.z}; }
-    D3 operator*(double s) const { return {x * s, y * s, z * s}; }
-    double dot(const D3& o) const { return x * o.x + y * o.y + z * o.z; }
-    D3 unit() const { return *this * (1.0 / std::sqrt(dot(*this))); }
-};
-D3 toD3(const V3f& v) { return {v.x, v.y, v.z}; }
-template <class C>
-double ch(const C& c, int k) { return k == 0 ? c.r : k == 1 ? c.g : c.b; }
-
+D3 mirror(const D3& v, const D3& n) { return n * (2 * v.dot(n)) - v; }
+double ch(const Rgb& c, int k) { return k == 0 ? c.r : k == 1 ? c.g : c.b; }
+float uniform(std::mt19937& rng, float lo = 0, float hi = 1) { return std::uniform_real_distribution(lo, hi)(rng); }
+Rgb randomRgb(std::mt19937& rng) { return {uniform(rng), uniform(rng), uniform(rng)}; }
 V3f randomUnit(std::mt19937& rng) {
-    std::normal_distribution<float> g;
-    for (;;)
+    for (std::normal_distribution<float> g;;)
         if (const V3f v(g(rng), g(rng), g(rng)); v.length() > 0.1f) return v.getNormalized();
 }
-Rgb randomRgb(std::mt19937& rng) {
-    std::uniform_real_distribution<float> u(0.0f, 1.0f);
-    return {u(rng), u(rng), u(rng)};
-}
 
-// A directional light of fixed direction and colours, lighting the side that its direction faces,
-// with a fixed shadow.
-class StubLight : public RsLightShader {
-public:
+// A directional light lighting the side that its direction faces, with a fixed shadow; counts locks.
+struct StubLight : public RsLightShader {
     StubLight(const V3f& direction, const Rgb& colour, const Rgb& ambient, const Rgb& shadow = {1, 1, 1})
-        : _direction(direction), _colour(colour), _ambientColour(ambient), _shadow(shadow) {
-        _emitAmbient = true;
-    }
+        : _direction(direction), _colour(colour), _ambientColour(ambient), _shadow(shadow) { _emitAmbient = true; }
     void setupRender(const GeAffineMatrix3<float>&) override {}
     void initializeMaps(const RCShdPtr<RsScene>&) override {}
     bool illuminate(const RsShadingContext& context, Illumination& illumination) const override {
@@ -59,286 +43,146 @@ public:
         return illumination._cosine > 0.0f;
     }
     Rgb shadow(const RsShadingContext&) override { return _shadow; }
+    void lockMemoryImpl() override { ++_lockImpls; }
+    void unlockMemoryImpl() override {}
     V3f _direction;
     Rgb _colour, _ambientColour, _shadow;
     int _lockImpls = 0;
-
-protected:
-    void lockMemoryImpl() override { ++_lockImpls; }
-    void unlockMemoryImpl() override {}
 };
 
-// The lighting model in double, channel by channel: emissive + ambient x (the context's and the
-// lights' ambient) + diffuse x the sum of colour x cosine over the lights in front + specular x the
-// sum of colour x (H . N)^(2^(10 s)) over those whose half vector H lies on the normal's side.
-Rgba litColour(const SdMaterial& m, const D3& n, const D3& v, const std::vector<const StubLight*>& lights,
-               const Rgb& contextAmbient = {}) {
-    double out[3];
-    for (int k = 0; k < 3; ++k) {
-        double amb = ch(contextAmbient, k), dif = 0, spe = 0;
-        for (const StubLight* l : lights) {
-            const D3 d = toD3(l->_direction);
-            const double cosine = d.dot(n), c = (v + d).unit().dot(n);
-            if (l->_emitAmbient) amb += ch(l->_ambientColour, k);
-            if (cosine > 0 && l->_emitDiffuse) dif += ch(l->_colour, k) * cosine;
-            if (cosine > 0 && l->_emitSpecular && c > 0)
-                spe += ch(l->_colour, k) * std::pow(c, std::exp2(10.0 * m._shininess));
-        }
-        out[k] = ch(m._emissive, k) + amb * ch(m._ambient, k) + dif * ch(m._diffuse, k) + spe * ch(m._specular, k);
+// A map of a constant colour whose sampler records where it was asked.
+struct RecordingParams : public ConstantParams {
+    RecordingParams(const Rgba& colour, float weight) : ConstantParams(colour, weight), _colour(colour) {}
+    OPtr<SdTextureSampler> createSampler() const override {
+        OPtr<SdTextureSampler> sampler = ConstantParams::createSampler();
+        _made = static_cast<const ConstantSampler*>(sampler.get());
+        return sampler;
     }
-    return Rgba(float(out[0]), float(out[1]), float(out[2]), m._opacity);
+    Rgba _colour;
+    mutable const ConstantSampler* _made = nullptr;
+};
+
+// Channel k (3: alpha) of what a map of RecordingParams gives; 1 without a map.
+double sampleOf(const Map& p, int k) { return p ? channelOf(static_cast<const RecordingParams&>(*p)._colour, k) : 1.0; }
+
+enum Kind { standard, simple, noShade, shadow };
+
+// Channel k (3: alpha) of shader kind for material m at unit normal n and view v. The standard
+// shader's own colour: emissive + ambient x ambient light + diffuse x the sum of colour x cosine over
+// lit lights + specular x the sum of colour x (H . N)^(2^(10 s)) where H . N > 0; the others': the
+// diffuse. Each map brings colour x weight x sample; the diffuse map's scale own + irradiance and
+// alpha, then reflection and refraction (not for no-shade) add. A shadow passes u = 1 - alpha, x u.
+double closedForm(Kind kind, const SdMaterial& m, const D3& n, const D3& v,
+                  const RsScene::LightList& lights, const Rgb& contextAmbient, int k) {
+    const auto env = [&](const Map& p, const Rgb& c) {
+        return p && kind < noShade ? ch(c, k) * p->getWeight() * sampleOf(p, k) : 0.0;
+    };
+    const double a = m._opacity * sampleOf(m._diffuseMap, 3), wd = m._diffuseMap ? m._diffuseMap->getWeight() : 1.0;
+    double own = ch(m._diffuse, k), amb = ch(contextAmbient, k), dif = 0, spe = 0;
+    for (const RCShdPtr<RsLightShader>& light : lights) {
+        const StubLight* l = static_cast<const StubLight*>(light.get());
+        const D3 to = D3(l->_direction);
+        const double cosine = to.dot(n), c = (v + to).getNormalized().dot(n), e = std::exp2(10.0 * m._shininess);
+        if (l->_emitAmbient) amb += ch(l->_ambientColour, k);
+        if (cosine > 0 && l->_emitDiffuse) dif += ch(l->_colour, k) * cosine;
+        if (cosine > 0 && l->_emitSpecular && c > 0) spe += ch(l->_colour, k) * std::pow(c, e);
+    }
+    if (kind == standard) own = ch(m._emissive, k) + amb * ch(m._ambient, k) + dif * own + spe * ch(m._specular, k);
+    if (k == 3 || kind == shadow) return k == 3 ? a : (1 - a) * (1 - a + a * wd * own * sampleOf(m._diffuseMap, k));
+    return wd * (own + env(m._irradianceMap, m._irradiance)) * sampleOf(m._diffuseMap, k) +
+           env(m._reflectionMap, m._reflection) + env(m._refractionMap, m._refraction);
 }
 
-RCShdPtr<SdMaterial> randomMaterial(std::mt19937& rng) {
-    static const float shininess[] = {0.0f, 0.1f, 0.2f, 0.35f, 0.5f, 0.73f};
-    RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
-    m->_emissive = randomRgb(rng) * 0.2f;
-    m->_ambient = randomRgb(rng);
-    m->_diffuse = randomRgb(rng);
-    m->_specular = randomRgb(rng);
-    m->_irradiance = randomRgb(rng);
-    m->_reflection = randomRgb(rng);
-    m->_refraction = randomRgb(rng);
-    m->_opacity = std::uniform_real_distribution<float>(0.0f, 1.0f)(rng);
-    m->_shininess = shininess[rng() % 6];
-    m->_refractionIndex = std::uniform_real_distribution<float>(0.6f, 1.6f)(rng);
-    return m;
+// Where direction d meets a mirror ball seen from +z: there its normal is the half vector of d and +z.
+GePoint2<double> mirrorBall(const D3& d) {
+    const D3 h = (d + D3(0, 0, 1)).getNormalized();
+    return {0.5 + 0.5 * h.x, 0.5 + 0.5 * h.y};
 }
 
-// Initialises shader for an instance whose light table is linked, in a scene of lights.
-void initialize(RsMaterialShader& shader, RsScene::LightList lights, std::vector<unsigned int> linked = {}) {
+// Initialises shader for an instance whose light table is linked, in a scene of lights, and shades.
+Rgba shade(RsMaterialShader& shader, RsShadingContext& context, RsScene::LightList lights,
+           std::vector<unsigned int> linked = {}) {
     RCShdPtr<RsScene> scene = makeScene({}, lights);
     RCShdPtr<const RsGeomInstance> instance = makeShared<RsGeomInstance>(
         GeAffineMatrix3<float>(), makeBoxMesh({0, 0, 0}, {1, 1, 1}), RsGeomInstance::MaterialList{},
         RsGeomInstance::MaterialList{}, SdInstanceAttributes{}, linked);
     shader.initialize(scene, instance);
-}
-
-Rgba shadeLocked(RsMaterialShader& shader, RsShadingContext& context) {
     shader.lockMemory();
     const Rgba colour = shader.shade(context);
     shader.unlockMemory();
     return colour;
 }
 
-// A bump map whose sample (1, 0.5, 0.5) at weight 1 turns the normal onto the tangent.
-RCShdPtr<const SdTextureParams> bumpOntoTangent() { return makeShared<ConstantParams>(Rgba(1.0f, 0.5f, 0.5f, 1.0f)); }
-
-// Random normals, views (perspective and orthographic), lights in front and behind with random
-// emission flags, shininess from 0 (exponent 1, where a negative H . N would subtract) up, and
-// every other time a bump map that turns the normal onto the tangent.
-TEST(RsStdMaterialShader, ShadesTheClosedFormAtRandomFrames) {
+// Random materials, maps, frames (perspective or orthographic), lights in front and behind with random
+// emission flags, shininess from 0 (exponent 1: H . N < 0 would subtract), a bump map onto the tangent
+// (weight 1) or of weight 0. Each map is read once with the fragment's derivatives: irradiance at the
+// (bumped) normal's sphere-map place, diffuse at the fragment's coordinate (restored), reflection at
+// the mirrored view's place, refraction at (-T.x, T.y, 1 - T.z) normalised, T the view mirrored about
+// index x normal; the last place stays.
+TEST(RsMaterialShaders, ShadeTheClosedFormAndReadTheirMapsWhereTheyPointAtRandomFrames) {
     std::mt19937 rng(11);
-    int behind = 0, skipped = 0;
-    for (int trial = 0; trial < 400; ++trial) {
-        RCShdPtr<SdMaterial> m = randomMaterial(rng);
-        if (trial % 2) m->_bumpMap = bumpOntoTangent();
-        RsStdMaterialShader shader(m);
+    for (int trial = 0; trial < 1200; ++trial) {
+        const Kind kind = Kind(trial % 4);
+        const int bump = trial / 4 % 3;  // none, onto the tangent, of weight 0
+        SCOPED_TRACE("kind " + std::to_string(kind) + ", trial " + std::to_string(trial));
+        RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
+        for (Rgb* c : {&m->_emissive, &m->_ambient, &m->_diffuse, &m->_specular, &m->_irradiance, &m->_reflection,
+                       &m->_refraction})
+            *c = randomRgb(rng);
+        std::tie(m->_opacity, m->_shininess, m->_refractionIndex) =
+            std::tuple{trial % 9 < 2 ? float(trial % 9) : uniform(rng), 0.15f * (rng() % 6), uniform(rng, 0.6f, 1.6f)};
+        RCShdPtr<RecordingParams> maps[4];  // irradiance, diffuse, reflection, refraction
+        Map* slots[4] = {&m->_irradianceMap, &m->_diffuseMap, &m->_reflectionMap, &m->_refractionMap};
+        for (int i = 0; i < 4; ++i)
+            if (rng() % 3)
+                *slots[i] = maps[i] = makeShared<RecordingParams>(Rgba(randomRgb(rng), uniform(rng, 0.2f)),
+                                                                  uniform(rng, 0.2f, 1.5f));
+        if (bump) m->_bumpMap = makeShared<ConstantParams>(Rgba(1.0f, 0.5f, 0.5f, 1.0f), bump == 1 ? 1.0f : 0.0f);
+        const RCShdPtr<RsMaterialShader> shaders[] = {makeShared<RsStdMaterialShader>(m),
+            makeShared<RsSimpleMaterialShader>(m), makeShared<RsNoShadeMaterialShader>(m), makeShared<RsShadowShader>(m)};
         RsScene::LightList lights;
-        std::vector<const StubLight*> stubs;
-        for (int i = 0, count = int(rng() % 4); i < count; ++i) {
+        for (int i = 0, count = kind == standard ? int(rng() % 4) : 0; i < count; ++i) {
             auto light = makeShared<StubLight>(randomUnit(rng), randomRgb(rng), randomRgb(rng) * 0.5f);
-            light->_emitAmbient = rng() % 3 != 0;
-            light->_emitDiffuse = rng() % 4 != 0;
-            light->_emitSpecular = rng() % 4 != 0;
-            stubs.push_back(light.get());
+            std::tie(light->_emitAmbient, light->_emitDiffuse, light->_emitSpecular) =
+                std::tuple{rng() % 3 != 0, rng() % 4 != 0, rng() % 4 != 0};
             lights.push_back(light);
         }
-        initialize(shader, lights);
         RsShadingContext context;
-        context._normal = randomUnit(rng);
-        context._tangent = randomUnit(rng) * 0.7f;
-        context._ambient = randomRgb(rng) * 0.3f;
-        context._orthographic = trial % 5 == 0;
-        context._viewDirection = randomUnit(rng);
-        context._eyeCoord = GePoint3<float>(0, 0, 0) + randomUnit(rng) * -3.0f;
-        const D3 n = toD3(trial % 2 ? context._tangent : context._normal).unit();
-        const D3 v = toD3(context._orthographic ? -context._viewDirection : -context._eyeCoord.toVector()).unit();
-        for (const StubLight* l : stubs) {
-            behind += toD3(l->_direction).dot(n) <= 0;
-            skipped += toD3(l->_direction).dot(n) > 0 && (v + toD3(l->_direction)).dot(n) <= 0;
-        }
-        expectNearRgba(shadeLocked(shader, context), litColour(*m, n, v, stubs, context._ambient), 2e-5,
-                       "trial " + std::to_string(trial));
-    }
-    EXPECT_GT(behind, 100);
-    EXPECT_GT(skipped, 20);
-}
-
-// A quad facing the camera under one directional light, through the renderer in perspective: at
-// every pixel the closed form at the point that the pixel centre sees. A second, brighter light is
-// linked so that it excludes the quad and must add nothing; the linked one is locked for drawing.
-TEST(RsStdMaterialShader, FlatQuadThroughTheRendererMatchesTheClosedFormAtEveryPixel) {
-    const GeRectangle<int> rect{0, 64, 0, 48};
-    const GeProjectiveMatrix3<double> projection = perspective(1.0471975511965976, 0.5, 100.0);
-    const float z = -2.0f;
-    RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
-    m->_emissive = {0.05f, 0.02f, 0.0f};
-    m->_ambient = {0.1f, 0.2f, 0.3f};
-    m->_diffuse = {0.5f, 0.4f, 0.3f};
-    m->_specular = {0.3f, 0.3f, 0.2f};
-    m->_shininess = 0.4f;
-    auto shader = makeShared<RsStdMaterialShader>(m);
-    auto shining = makeShared<StubLight>(V3f(0.3f, 0.2f, 0.9f).getNormalized(), Rgb(0.9f, 0.8f, 0.7f), Rgb(0.3f));
-    auto excluding = makeShared<StubLight>(V3f(0.0f, 0.0f, 1.0f), Rgb(5.0f), Rgb(5.0f));
-    shining->_lightId = 3;
-    shining->_linkMode = SdLight::LinkMode::include;
-    excluding->_lightId = 4;
-    const RCShdPtr<RsGeomInstance> instance = makeInstance(
-        makeMesh({{-3, -3, z}, {3, -3, z}, {3, 3, z}, {-3, 3, z}}, {0, 1, 2, 0, 2, 3}), {}, {}, {shader});
-    instance->_lights = {3, 4};
-    RCShdPtr<RsScene> scene = makeScene({instance}, {excluding, shining});
-    RCShdPtr<const RsGeomInstance> constInstance = instance;
-    shader->initialize(scene, constInstance);
-
-    Picture picture(rect);
-    render(scene, projection, rect, picture);
-    EXPECT_GT(shining->_lockImpls, 0);
-    EXPECT_EQ(shining->_lockCount, 0);
-    for (int py = rect.y0; py < rect.y1; ++py)
-        for (int px = rect.x0; px < rect.x1; ++px) {
-            const D3 toEye{-(px + 0.5 - 32) / 32 / projection(0, 0), -(py + 0.5 - 24) / 24 / projection(1, 1), 1};
-            expectNearRgba(picture.at(px, py), litColour(*m, {0, 0, 1}, toEye.unit(), {shining.get()}), 1e-4,
-                           std::to_string(px) + ", " + std::to_string(py));
-        }
-}
-
-// Every map at a random weight, with constant samples. The diffuse map's weight scales the
-// standard shader's emissive, ambient, diffuse, specular and irradiance colours, or the flat colour
-// of the simple and no-shade shaders; its sample multiplies all of that and alpha. Reflection and
-// refraction come on top with their own weights (not for the no-shade shader). The first case is
-// the diffuse map (0.5, 0.5, 0.5, 0.5) of weight 1, which halves alpha and colour, not reflection.
-TEST(RsMaterialShaders, MapsScaleTheirTermsAndTheDiffuseMapTexturesAllButTheEnvironment) {
-    std::mt19937 rng(5);
-    std::uniform_real_distribution<float> weight(0.2f, 1.5f);
-    for (int trial = 0; trial < 90; ++trial) {
-        const int kind = trial % 3;  // standard, simple, no shade
-        RCShdPtr<SdMaterial> m = randomMaterial(rng);
-        const bool half = trial == 0, refracts = trial % 2 == 0;
-        const float wd = half ? 1.0f : weight(rng), wi = weight(rng), wl = weight(rng), wr = weight(rng);
-        const Rgba ds = half ? Rgba(0.5f, 0.5f, 0.5f, 0.5f) : Rgba(randomRgb(rng), 0.6f), is(randomRgb(rng), 1),
-                   ls(randomRgb(rng), 1), rs(randomRgb(rng), 1);
-        m->_diffuseMap = makeShared<ConstantParams>(ds, wd);
-        m->_irradianceMap = makeShared<ConstantParams>(is, wi);
-        m->_reflectionMap = makeShared<ConstantParams>(ls, wl);
-        if (refracts) m->_refractionMap = makeShared<ConstantParams>(rs, wr);
-        RCShdPtr<RsMaterialShader> shader;
-        if (kind == 0) shader = makeShared<RsStdMaterialShader>(m);
-        if (kind == 1) shader = makeShared<RsSimpleMaterialShader>(m);
-        if (kind == 2) shader = makeShared<RsNoShadeMaterialShader>(m);
-        auto light = makeShared<StubLight>(randomUnit(rng), randomRgb(rng), randomRgb(rng));
-        initialize(*shader, {light});
-        RsShadingContext context;
-        context._normal = randomUnit(rng);
-        context._eyeCoord = GePoint3<float>(0.5f, -0.5f, -4.0f);
-
-        const Rgba base = kind == 0 ? litColour(*m, toD3(context._normal), D3{-0.5, 0.5, 4}.unit(), {light.get()})
-                                    : Rgba(m->_diffuse, m->_opacity);
-        Rgba want(0, 0, 0, m->_opacity * ds.a);
-        for (int k = 0; k < 3; ++k) {
-            const double lit = wd * ch(base, k) + (kind < 2 ? wd * wi * ch(m->_irradiance, k) * ch(is, k) : 0.0);
-            const double refraction = refracts ? wr * ch(m->_refraction, k) * ch(rs, k) : 0.0;
-            const double environment = kind < 2 ? wl * ch(m->_reflection, k) * ch(ls, k) + refraction : 0.0;
-            channelOf(want, k) = float(lit * ch(ds, k) + environment);
-        }
-        expectNearRgba(shadeLocked(*shader, context), want, 2e-5,
-                       "kind " + std::to_string(kind) + ", trial " + std::to_string(trial));
-    }
-}
-
-// A map whose sampler records where it was asked.
-class RecordingParams : public ConstantParams {
-public:
-    RecordingParams() : ConstantParams(Rgba(0.25f, 0.5f, 0.75f, 1.0f)) {}
-    OPtr<SdTextureSampler> createSampler() const override {
-        OPtr<SdTextureSampler> sampler = ConstantParams::createSampler();
-        _made = static_cast<const ConstantSampler*>(sampler.get());
-        return sampler;
-    }
-    mutable const ConstantSampler* _made = nullptr;
-};
-
-// Where a unit direction d meets a mirror ball seen from +z: the ball's normal there is the half
-// vector of d and +z, whose x and y, halved and moved to the centre, are the position.
-GePoint2<double> mirrorBall(const D3& d) {
-    const D3 h = (d + D3{0, 0, 1}).unit();
-    return {0.5 + 0.5 * h.x, 0.5 + 0.5 * h.y};
-}
-
-// The standard and the simple shader read the irradiance map at the place of the normal (after
-// the bump map, which here turns it onto the tangent) on the sphere map, the diffuse map at the
-// fragment's own coordinate (restored after the irradiance lookup), the reflection map at the
-// mirrored view's place, and the refraction map at (-T.x, T.y, 1 - T.z) normalised, for T the view
-// mirrored about the normal scaled by the index; the last lookup's position stays in the context.
-// Each lookup carries the fragment's derivatives.
-TEST(RsMaterialShaders, EnvironmentLookupsSampleAtTheirSphereMapPositions) {
-    std::mt19937 rng(17);
-    for (int trial = 0; trial < 200; ++trial) {
-        const bool simple = trial % 2 == 1, bumped = trial % 4 < 2, refracts = trial % 3 != 0;
-        RCShdPtr<SdMaterial> m = randomMaterial(rng);
-        RCShdPtr<RecordingParams> maps[4] = {makeShared<RecordingParams>(), makeShared<RecordingParams>(),
-                                             makeShared<RecordingParams>(), makeShared<RecordingParams>()};
-        m->_irradianceMap = maps[0];
-        m->_diffuseMap = maps[1];
-        m->_reflectionMap = maps[2];
-        if (refracts) m->_refractionMap = maps[3];
-        if (bumped) m->_bumpMap = bumpOntoTangent();
-        RCShdPtr<RsMaterialShader> shader = simple ? RCShdPtr<RsMaterialShader>(makeShared<RsSimpleMaterialShader>(m))
-                                                   : RCShdPtr<RsMaterialShader>(makeShared<RsStdMaterialShader>(m));
-        // Frames away from the lookups' poles, where a position is not well defined.
-        RsShadingContext context;
-        D3 n, r, u;
-        for (bool poled = true; poled;) {
+        const GeLinearMatrix2<double> derivatives(0.01, 0.02, 0.03, 0.04);
+        std::tie(context._ambient, context._orthographic, context._texCoord, context._texCoordDerivatives) =
+            std::tuple{randomRgb(rng) * 0.3f, trial % 5 == 0, GePoint2<double>(0.3, 0.7), derivatives};
+        D3 n, v, u;
+        for (bool poled = true; poled;) {  // away from the lookups' poles, where a place is ill-defined
             context._normal = randomUnit(rng);
-            context._tangent = randomUnit(rng);
+            context._tangent = randomUnit(rng) * 0.7f;
+            context._viewDirection = randomUnit(rng);
             context._eyeCoord = GePoint3<float>(0, 0, 0) + randomUnit(rng) * -2.5f;
-            n = toD3(bumped ? context._tangent : context._normal);
-            const D3 v = toD3(-context._eyeCoord.toVector()).unit(), np = n * m->_refractionIndex;
-            r = n * (2 * v.dot(n)) + v * -1.0;
-            const D3 t = np * (2 * v.dot(np)) + v * -1.0, w{-t.x, t.y, 1 - t.z};
-            poled = n.z < -0.9 || r.z < -0.9 || w.dot(w) < 0.1;
-            if (!poled) u = w.unit();
+            n = D3(bump == 1 ? context._tangent : context._normal).getNormalized();
+            v = D3(context._orthographic ? -context._viewDirection : -context._eyeCoord.toVector()).getNormalized();
+            const D3 t = mirror(v, n * m->_refractionIndex), w{-t.x, t.y, 1 - t.z};
+            poled = n.z < -0.9 || mirror(v, n).z < -0.9 || w.dot(w) < 0.1;
+            if (!poled) u = w.getNormalized();
         }
-        context._texCoord = {0.3, 0.7};
-        context._texCoordDerivatives = GeLinearMatrix2<double>(0.01, 0.02, 0.03, 0.04);
-        shadeLocked(*shader, context);
+        const unsigned int needs = shaders[kind]->getNeededContext();  // what it leaves out is poisoned
+        const V3f poison = V3f(1, 1, 1) * std::nanf("");
+        if (!(needs & RsShadingContext::needsEyeCoord)) context._eyeCoord = GePoint3<float>(0, 0, 0) + poison;
+        if (!(needs & RsShadingContext::needsNormal)) context._normal = poison;
+        if (!(needs & RsShadingContext::needsTangents)) context._tangent = context._binormal = poison;
 
-        const GePoint2<double> want[4] = {mirrorBall(n), {0.3, 0.7}, mirrorBall(r), {0.5 + 0.5 * u.x, 0.5 + 0.5 * u.y}};
-        const std::string where = (simple ? "simple, trial " : "standard, trial ") + std::to_string(trial);
-        for (int k = 0; k < (refracts ? 4 : 3); ++k) {
-            const ConstantSampler& s = *maps[k]->_made;
-            ASSERT_EQ(s._lookups, 1) << where << " map " << k;
-            EXPECT_NEAR(s._lastTexCoord.x, want[k].x, 2e-6) << where << " map " << k;
-            EXPECT_NEAR(s._lastTexCoord.y, want[k].y, 2e-6) << where << " map " << k;
-            EXPECT_EQ(s._lastDerivatives, context._texCoordDerivatives) << where << " map " << k;
+        const Rgba got = shade(*shaders[kind], context, lights);
+        for (int k = 0; k < 4; ++k)
+            EXPECT_NEAR(channelOf(got, k), closedForm(kind, *m, n, v, lights, context._ambient, k), 2e-5);
+        for (const auto& l : lights) EXPECT_TRUE(static_cast<StubLight&>(*l)._lockImpls == 1 && l->_lockCount == 0);
+        const GePoint2<double> want[4] = {mirrorBall(n), {0.3, 0.7}, mirrorBall(mirror(v, n)),
+                                          {0.5 + u.x / 2, 0.5 + u.y / 2}};
+        for (int i = kind < noShade ? 0 : 1; i < (kind < noShade ? 4 : 2); ++i)
+            if (const ConstantSampler* s = maps[i] ? maps[i]->_made : nullptr; maps[i]) {
+                ASSERT_TRUE(s && s->_lookups == 1 && s->_lastDerivatives == context._texCoordDerivatives) << i;
+                EXPECT_LT(std::hypot(s->_lastTexCoord.x - want[i].x, s->_lastTexCoord.y - want[i].y), 3e-6) << i;
+            }
+        if (kind < noShade && (maps[2] || maps[3])) {
+            EXPECT_EQ(context._texCoord, maps[maps[3] ? 3 : 2]->_made->_lastTexCoord);
         }
-        EXPECT_EQ(context._texCoord, maps[refracts ? 3 : 2]->_made->_lastTexCoord) << where;
-    }
-}
-
-// Seen from a light, a surface of coverage a = opacity x map alpha lets u = 1 - a through untinted
-// and tints the rest by its colour and map, and what passes is scaled by u once more: clear gives
-// white without alpha, opaque gives black with alpha 1, whatever the colour.
-TEST(RsShadowShader, GivesTheTransmittanceOfTheSurface) {
-    std::mt19937 rng(29);
-    for (int trial = 0; trial < 60; ++trial) {
-        RCShdPtr<SdMaterial> m = randomMaterial(rng);
-        const float opacities[] = {0.0f, 1.0f, m->_opacity};
-        m->_opacity = opacities[trial % 3];
-        const bool mapped = trial % 2 == 1;
-        const Rgba sample(randomRgb(rng), 0.8f);
-        if (mapped) m->_diffuseMap = makeShared<ConstantParams>(sample, 0.7f);
-        RsShadowShader shader(m);
-        RsShadingContext context;
-        const Rgba got = shadeLocked(shader, context);
-        const double a = m->_opacity * (mapped ? sample.a : 1.0), u = 1 - a;
-        Rgba want(0, 0, 0, float(a));
-        for (int k = 0; k < 3; ++k)
-            channelOf(want, k) = float(u * (u + a * ch(m->_diffuse, k) * (mapped ? 0.7 * ch(sample, k) : 1.0)));
-        if (!mapped && (a == 0 || a == 1)) {
-            EXPECT_EQ(got, a == 0 ? Rgba(1, 1, 1, 0) : Rgba(0, 0, 0, 1));
-        }
-        expectNearRgba(got, want, 1e-6, "trial " + std::to_string(trial));
     }
 }
 
@@ -346,40 +190,25 @@ TEST(RsShadowShader, GivesTheTransmittanceOfTheSurface) {
 // shared out among them, and 1; 1 less that when inverted; alpha 1. Light 9 is not linked to the
 // instance and counts neither in the sum nor in the sharing.
 TEST(RsShadowMatteShader, ShowsTheSharedShadowSumOfItsLinkedLights) {
-    struct Case {
-        std::vector<Rgb> shadows;  // of lights 1, 2, ...; all linked
-        float strength;
-        Rgb want;
-    };
+    struct Case { std::vector<Rgb> shadows; float strength; Rgb want; };  // shadows of lights 1, 2, ...
     const Case cases[] = {
-        {{}, 1.0f, {0, 0, 0}},
-        {{{0.25f, 0.5f, 1.0f}}, 0.8f, {0.2f, 0.4f, 0.8f}},
-        {{{0.3f, 0.6f, 1.0f}}, 2.0f, {0.6f, 1.0f, 1.0f}},
-        {{{1, 1, 1}, {1, 1, 1}}, 1.0f, {1, 1, 1}},
+        {{}, 1.0f, {0, 0, 0}}, {{{0.3f, 0.6f, 1.0f}}, 2.0f, {0.6f, 1.0f, 1.0f}},
         {{{1.0f, 0.0f, 0.5f}, {1.0f, 1.0f, 0.1f}}, 1.0f, {1.0f, 0.5f, 0.3f}},
-        {{{0.2f, 0.4f, 0.6f}, {0.2f, 0.0f, 0.6f}}, 1.5f, {0.3f, 0.3f, 0.9f}},
-    };
+        {{{0.2f, 0.4f, 0.6f}, {0.2f, 0.0f, 0.6f}}, 1.5f, {0.3f, 0.3f, 0.9f}}};
     for (const Case& c : cases)
         for (bool inverted : {false, true}) {
             RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
-            m->_shadowStrength = c.strength;
-            m->_inverted = inverted;
-            const auto light = [](unsigned int id, const Rgb& shadow) {
-                auto l = makeShared<StubLight>(V3f(0, 0, 1), Rgb(1.0f), Rgb(1.0f), shadow);
-                l->_lightId = id;
-                l->_linkMode = SdLight::LinkMode::include;
-                return l;
-            };
-            RsScene::LightList lights{light(9, Rgb(1.0f))};
-            std::vector<unsigned int> linked;
-            for (unsigned int id = 1; id <= c.shadows.size(); ++id)
-                lights.push_back(light(id, c.shadows[id - 1])), linked.push_back(id);
+            std::tie(m->_shadowStrength, m->_inverted) = std::tuple{c.strength, inverted};
+            RsScene::LightList lights;
+            for (unsigned int id = 0; id <= c.shadows.size(); ++id) {  // light 0 stands for light 9
+                auto l = makeShared<StubLight>(V3f(0, 0, 1), Rgb(1.0f), Rgb(1.0f), id ? c.shadows[id - 1] : Rgb(1.0f));
+                std::tie(l->_lightId, l->_linkMode) = std::tuple{id ? id : 9, SdLight::LinkMode::include};
+                lights.push_back(l);
+            }
             RsShadowMatteShader shader(m);
-            initialize(shader, lights, linked);
             RsShadingContext context;
-            expectNearRgba(shadeLocked(shader, context), Rgba(inverted ? Rgb(1.0f) - c.want : c.want, 1.0f), 1e-6,
-                           std::to_string(c.shadows.size()) + " lights, strength " + std::to_string(c.strength) +
-                               (inverted ? ", inverted" : ""));
+            expectNearRgba(shade(shader, context, lights, {1, 2}), Rgba(inverted ? Rgb(1.0f) - c.want : c.want, 1.0f), 1e-6,
+                           "case " + std::to_string(&c - cases) + (inverted ? ", inverted" : ""));
         }
 }
 
