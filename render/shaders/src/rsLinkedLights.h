@@ -1,7 +1,8 @@
 #pragma once
-// The lights of a scene that shine on one instance: those whose includes() holds for the
-// instance's light table, in the scene's order. The lit material shaders keep this list from
-// their initialize on, and visit it per fragment.
+// The lit material shaders' common part: on top of Base (RsMaterialShader or one of its
+// subclasses), the lights of the scene that shine on the shader's instance - those whose
+// includes() holds for the instance's light table, in the scene's order. initialize picks them;
+// the subclass visits them per fragment, and locks them if its lookups need them locked.
 #include <vector>
 
 #include "rcShdPtr.h"
@@ -11,20 +12,24 @@
 
 namespace Zr {
 
-struct RsLinkedLights {
-    using LightList = std::vector<RCShdPtr<RsLightShader>>;
-
-    // Replaces lights by the scene's lights that reach instance. A null scene, instance or light
-    // is reported as a null pointer failure.
-    static void select(const RCShdPtr<RsScene>& scene, const RCShdPtr<const RsGeomInstance>& instance,
-                       LightList& lights) {
+template <class Base>
+class RsLinkedLights : public Base {
+public:
+    // Replaces the lights by the scene's lights that reach instance. A null scene, instance or
+    // light is reported as a null pointer failure.
+    void initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) override {
         const RsScene::LightList& all = scene->_lights;
         const RsGeomInstance::LightSet& table = instance->_lights;
-        lights.clear();
-        lights.reserve(all.size());
+        _lights.clear();
+        _lights.reserve(all.size());
         for (const RCShdPtr<RsLightShader>& light : all)
-            if (light->includes(table)) lights.push_back(light);
+            if (light->includes(table)) _lights.push_back(light);
     }
+
+protected:
+    using Base::Base;
+
+    std::vector<RCShdPtr<RsLightShader>> _lights;
 };
 
 }  // namespace Zr

@@ -5,10 +5,10 @@
 namespace Zr {
 
 RsShadowMatteShader::RsShadowMatteShader(const RCShdPtr<const SdMaterial>& material)
-    : RsMaterialShader(material), _inverted(material->_inverted), _strength(material->_shadowStrength) {}
+    : RsLinkedLights(material), _inverted(material->_inverted), _strength(material->_shadowStrength) {}
 
 void RsShadowMatteShader::initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) {
-    RsLinkedLights::select(scene, instance, _lights);
+    RsLinkedLights::initialize(scene, instance);
     _strength = _material->_shadowStrength;
     // Each light takes an equal share, so that a point lit by all of them shows full strength.
     if (_lights.size() > 1) _strength /= static_cast<float>(_lights.size());

@@ -11,12 +11,11 @@
 
 namespace Zr {
 
-class RsShadowMatteShader : public RsMaterialShader {
+class RsShadowMatteShader : public RsLinkedLights<RsMaterialShader> {
 public:
     explicit RsShadowMatteShader(const RCShdPtr<const SdMaterial>& material);
 
-    // Keeps the lights of scene whose linking includes instance, in the scene's order, and shares
-    // the shadow strength out among them.
+    // Picks the linked lights and shares the shadow strength out among them.
     void initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) override;
     // Per channel the smaller of (sum of the lights' shadow) x strength and 1, or 1 less that when
     // inverted; alpha 1.
@@ -34,7 +33,6 @@ protected:
 private:
     bool _inverted;
     float _strength;
-    RsLinkedLights::LightList _lights;
 };
 
 }  // namespace Zr

@@ -5,16 +5,12 @@
 namespace Zr {
 
 RsStdMaterialShader::RsStdMaterialShader(const RCShdPtr<const SdMaterial>& material)
-    : RsEnvironmentShader(material, RsShadingContext::needsEyeCoord | RsShadingContext::needsNormal),
+    : RsLinkedLights(material, RsShadingContext::needsEyeCoord | RsShadingContext::needsNormal),
       _emissive(scaleByTexture(material->_emissive, material->_diffuseMap)),
       _ambient(scaleByTexture(material->_ambient, material->_diffuseMap)),
       _specular(scaleByTexture(material->_specular, material->_diffuseMap)),
       _shininess(material->_shininess),
       _specularExponent(std::exp2(10.0f * material->_shininess)) {}
-
-void RsStdMaterialShader::initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) {
-    RsLinkedLights::select(scene, instance, _lights);
-}
 
 CoRgbaColorTyped<float> RsStdMaterialShader::shade(RsShadingContext& context) {
     const GeVector3<float> view = bumpAndView(context);

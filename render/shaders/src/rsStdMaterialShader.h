@@ -16,12 +16,10 @@
 
 namespace Zr {
 
-class RsStdMaterialShader : public RsEnvironmentShader {
+class RsStdMaterialShader : public RsLinkedLights<RsEnvironmentShader> {
 public:
     explicit RsStdMaterialShader(const RCShdPtr<const SdMaterial>& material);
 
-    // Keeps the lights of scene whose linking includes instance, in the scene's order.
-    void initialize(RCShdPtr<RsScene>& scene, RCShdPtr<const RsGeomInstance>& instance) override;
     // Emissive + ambient + diffuse + specular of the linked lights, plus irradiance, all times the
     // diffuse map; then reflection and refraction added. Unclamped; alpha is the opacity times the
     // diffuse map's alpha. Writes the last lookup position into the context's _texCoord and the
@@ -44,7 +42,6 @@ private:
     float _shininess;
     // 2 to the power 10 _shininess: 1 for a shininess of 0, 1024 for 1.
     float _specularExponent;
-    RsLinkedLights::LightList _lights;
 };
 
 }  // namespace Zr
