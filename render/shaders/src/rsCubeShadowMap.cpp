@@ -44,26 +44,6 @@ RsCubeShadowMap::RsCubeShadowMap() = default;
 
 RsCubeShadowMap::~RsCubeShadowMap() = default;
 
-RsCubeShadowMap::RsCubeShadowMap(RsCubeShadowMap& other)
-    : RsShadowEvaluator(other),
-      _faces{other._faces[0], other._faces[1], other._faces[2],
-             other._faces[3], other._faces[4], other._faces[5]},
-      _cameraMatrix(other._cameraMatrix),
-      _center(other._center) {}
-
-RsCubeShadowMap::RsCubeShadowMap(RsCubeShadowMap&& other) : RsCubeShadowMap(other) {}
-
-RsCubeShadowMap& RsCubeShadowMap::operator=(RsCubeShadowMap& other) {
-    if (this != &other) {
-        for (int f = 0; f < kFaceCount; ++f) _faces[f] = other._faces[f];
-        _cameraMatrix = other._cameraMatrix;
-        _center = other._center;
-    }
-    return *this;
-}
-
-RsCubeShadowMap& RsCubeShadowMap::operator=(RsCubeShadowMap&& other) { return *this = other; }
-
 RsCubeShadowMap::CubeFace RsCubeShadowMap::chooseFace(const GeVector3<float>& q) {
     const float ax = std::fabs(q.x);
     const float ay = std::fabs(q.y);

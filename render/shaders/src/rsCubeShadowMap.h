@@ -42,11 +42,11 @@ public:
     RsCubeShadowMap();
     ~RsCubeShadowMap() override;
 
-    // Move each face's map; every other member is copied.
-    RsCubeShadowMap(RsCubeShadowMap& other);
-    RsCubeShadowMap(RsCubeShadowMap&& other);
-    RsCubeShadowMap& operator=(RsCubeShadowMap& other);
-    RsCubeShadowMap& operator=(RsCubeShadowMap&& other);
+    // Move each face's map (RsShadowMap's copying does); every other member is copied.
+    RsCubeShadowMap(RsCubeShadowMap& other) = default;
+    RsCubeShadowMap(RsCubeShadowMap&& other) = default;
+    RsCubeShadowMap& operator=(RsCubeShadowMap& other) = default;
+    RsCubeShadowMap& operator=(RsCubeShadowMap&& other) = default;
 
     CoRgbColorTyped<float> computeBestShadow(const GePoint3<float>& point) const override;
     CoRgbColorTyped<float> computeFastShadow(const GePoint3<float>& point) const override;

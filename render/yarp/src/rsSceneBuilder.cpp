@@ -31,8 +31,16 @@ RCShdPtr<const Target> castObject(const RCShdPtr<SdObject>& object) {
     return RCShdPtr<const Target>(target);
 }
 
-void checkBuilder(bool isNull, int line) {
-    if (isNull) Assertions::throwAssertionFailed(kSourceFile, line, "!builder.isNull()");
+// The shader that builder makes of object for instance, kept at the end of list. A missing builder
+// is an assertion failure reported at line.
+template <class Object, class Shader>
+RCShdPtr<Shader> buildInto(std::vector<RCShdPtr<Shader>>& list, const RCShdPtr<RsShaderBuilder<Object, Shader>>& builder,
+                           int line, const RCShdPtr<const SdInstance>& instance, const RCShdPtr<Object>& object,
+                           const RCShdPtr<RsSceneBuilder>& sceneBuilder) {
+    if (builder.isNull()) Assertions::throwAssertionFailed(kSourceFile, line, "!builder.isNull()");
+    RCShdPtr<Shader> shader = builder->build(instance, object, sceneBuilder);
+    list.push_back(shader);
+    return shader;
 }
 
 }  // namespace
@@ -99,11 +107,8 @@ RCShdPtr<RsGeomInstance> RsSceneBuilder::add(const RCShdPtr<const SdInstance>& i
 RCShdPtr<RsLightShader> RsSceneBuilder::add(const RCShdPtr<const SdInstance>& instance,
                                             const RCShdPtr<const SdLight>& light) {
     if (!light->_enabled) return {};
-    RCShdPtr<RsLightShaderBuilder> builder = RsSceneRegistry::getInstance().getLightShaderBuilder(light->getType());
-    checkBuilder(builder.isNull(), lineNullLightBuilder);
-    RCShdPtr<RsLightShader> shader = builder->build(instance, light, asShared());
-    _lights.push_back(shader);
-    return shader;
+    return buildInto(_lights, RsSceneRegistry::getInstance().getLightShaderBuilder(light->getType()),
+                     lineNullLightBuilder, instance, light, asShared());
 }
 
 void RsSceneBuilder::add(const RCShdPtr<const SdInstance>& instance, const RCShdPtr<const SdCamera>& /*camera*/) {
@@ -112,22 +117,14 @@ void RsSceneBuilder::add(const RCShdPtr<const SdInstance>& instance, const RCShd
 
 RCShdPtr<RsMaterialShader> RsSceneBuilder::add(const RCShdPtr<const SdInstance>& instance,
                                                const RCShdPtr<const SdMaterial>& material) {
-    RCShdPtr<RsMaterialShaderBuilder> builder =
-        RsSceneRegistry::getInstance().getMaterialShaderBuilder(material->getType());
-    checkBuilder(builder.isNull(), lineNullMaterialBuilder);
-    RCShdPtr<RsMaterialShader> shader = builder->build(instance, material, asShared());
-    _materialShaders.push_back(shader);
-    return shader;
+    return buildInto(_materialShaders, RsSceneRegistry::getInstance().getMaterialShaderBuilder(material->getType()),
+                     lineNullMaterialBuilder, instance, material, asShared());
 }
 
 RCShdPtr<RsMaterialShader> RsSceneBuilder::addShadow(const RCShdPtr<const SdInstance>& instance,
                                                      const RCShdPtr<const SdMaterial>& material) {
-    RCShdPtr<RsMaterialShaderBuilder> builder =
-        RsSceneRegistry::getInstance().getShadowShaderBuilder(material->getType());
-    checkBuilder(builder.isNull(), lineNullShadowBuilder);
-    RCShdPtr<RsMaterialShader> shader = builder->build(instance, material, asShared());
-    _shadowShaders.push_back(shader);
-    return shader;
+    return buildInto(_shadowShaders, RsSceneRegistry::getInstance().getShadowShaderBuilder(material->getType()),
+                     lineNullShadowBuilder, instance, material, asShared());
 }
 
 RCShdPtr<RsScene> RsSceneBuilder::createRendererScene() {
