@@ -95,7 +95,8 @@ TEST(RsSceneBuilderTest, SceneHasAShaderPerMaterialPerInstanceInitialisedBeforeT
     const RCShdPtr<SdObject> shapes[] = {shape(bare), shape(bare), shape(box)};
     for (int i = 0; i < 3; ++i) description->addGeometry(placed(shapes[i], materials[i], 0, float(i)));
     description->getGeometry()[0]->setLightTable({3, 1, 3});
-    description->getGeometry()[0]->getAttributes()._renderOrder = 9;
+    SdInstanceAttributes& attributes = description->getGeometry()[0]->getAttributes();
+    attributes._renderOrder = 9, attributes._castsShadows = false, attributes._drawBackFaces = false;
     description->addCamera(placed(makeShared<SdCamera>()));
     for (unsigned int n : {5, 6, 7}) description->addLight(placed(makeShared<ProbeLight>(n != 6), {}, n));
     const RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
