@@ -1,6 +1,6 @@
 // The material shader base: the counted lock protocol against a model and under racing threads,
-// the unbalanced-unlock and failed-lock cases, samplers for present and absent maps, weight
-// folding against closed forms, and mask composition from maps.
+// the unbalanced-unlock and failed-lock cases, and mask composition from maps. Samplers and the
+// folding of map weights are checked through the standard shaders that use them.
 #include <gtest/gtest.h>
 
 #include <random>
@@ -150,64 +150,9 @@ TEST(RsMaterialShader, ConcurrentLockersSeeOneHookCallPerLockCycle) {
 // Exposes the protected helpers of the base.
 class HelperAccess : public RsMaterialShader {
 public:
-    using RsMaterialShader::createSampler;
     using RsMaterialShader::neededContextOfBumpMap;
     using RsMaterialShader::neededContextOfMap;
-    using RsMaterialShader::scaleByTexture;
-    using RsMaterialShader::scaleByTextures;
 };
-
-// Without a map, or for a map that hands out no sampler, every lookup answers white; with a map,
-// a new sampler of the map's for each call.
-TEST(RsMaterialShader, CreateSamplerHandsOutTheMapsSamplerOrAWhiteOne) {
-    const Rgba white(1.0f, 1.0f, 1.0f, 1.0f);
-    const GePoint2<double> at(0.3, 0.7);
-    const GeLinearMatrix2<double> footprint(0.01, 0.0, 0.0, 0.01);
-    for (const Params& params :
-         {Params(), Params(makeShared<ConstantParams>(Rgba(0.2f, 0.2f, 0.2f, 0.2f), 1.0f, true))}) {
-        const OPtr<SdTextureSampler> sampler = HelperAccess::createSampler(params);
-        ASSERT_TRUE(sampler);
-        sampler->releaseTiles();
-        for (const Rgba& got : {sampler->sample(at, footprint), sampler->sample(at, GeLinearMatrix2<float>(footprint)),
-                                sampler->sample(at, 0.1, 0.1), sampler->sample(3, 4),
-                                sampler->sample(3, 4, 0.25f, 0.75f), sampler->sample(3, 4, GeLinearMatrix2<float>())})
-            EXPECT_EQ(got, white);
-    }
-    const Rgba colour(0.1f, 0.2f, 0.3f, 0.4f);
-    const Params map(makeShared<ConstantParams>(colour, 0.5f));
-    const OPtr<SdTextureSampler> first = HelperAccess::createSampler(map), second = HelperAccess::createSampler(map);
-    EXPECT_NE(first.get(), second.get());
-    EXPECT_EQ(first->sample(at, footprint), colour);
-}
-
-// A map's weight scales the colour (both maps' weights in turn); without a map the colour stays;
-// an alpha given is set, not scaled.
-TEST(RsMaterialShader, ScaleByTextureFoldsMapWeightsIntoColours) {
-    const Rgb colours[] = {{0.0f, 0.0f, 0.0f}, {1.0f, 0.5f, 0.25f}, {-2.0f, 3.5f, 1e-3f}, {7.0f, 0.1f, 0.9f}};
-    const float weights[] = {0.0f, 1.0f, 0.5f, 3.0f, -1.25f, 0.1f};
-    auto expectScaled = [](const Rgb& got, const Rgb& c, double w) {
-        EXPECT_NEAR(got.r, c.r * w, 1e-6 * (1 + std::abs(c.r * w)));
-        EXPECT_NEAR(got.g, c.g * w, 1e-6 * (1 + std::abs(c.g * w)));
-        EXPECT_NEAR(got.b, c.b * w, 1e-6 * (1 + std::abs(c.b * w)));
-    };
-    for (const Rgb& c : colours) {
-        EXPECT_EQ(HelperAccess::scaleByTexture(c, Params()), c);
-        EXPECT_EQ(HelperAccess::scaleByTextures(c, Params(), Params()), c);
-        for (float alpha : {0.0f, 0.35f, 1.0f, 2.0f})
-            EXPECT_EQ(HelperAccess::scaleByTexture(c, alpha, Params()), Rgba(c, alpha));
-        for (float w1 : weights) {
-            const Params map1 = makeMap(w1);
-            const Rgb one = HelperAccess::scaleByTexture(c, map1);
-            expectScaled(one, c, w1);
-            for (float alpha : {0.0f, 0.35f, 1.0f, 2.0f})
-                EXPECT_EQ(HelperAccess::scaleByTexture(c, alpha, map1), Rgba(one, alpha));
-            EXPECT_EQ(HelperAccess::scaleByTextures(c, map1, Params()), one);
-            EXPECT_EQ(HelperAccess::scaleByTextures(c, Params(), map1), one);
-            for (float w2 : weights)
-                expectScaled(HelperAccess::scaleByTextures(c, map1, makeMap(w2)), c, double(w1) * w2);
-        }
-    }
-}
 
 // A map adds the bits asked for (by default the texture coordinates) and a missing map nothing; a
 // bump map adds them only when its weight is not zero.

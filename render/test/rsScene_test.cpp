@@ -1,4 +1,4 @@
-// The renderer's scene records: what an instance keeps of its description, its world box against
+// The renderer's scene records: an instance's world box against
 // corner arithmetic in double, and the scene's bounds and epsilon, including scenes without
 // instances, flat instances, and null instances or meshes.
 #include <gtest/gtest.h>
@@ -39,24 +39,6 @@ GeAlignedBox3<float> randomBox(std::mt19937& rng) {
     return GeAlignedBox3<float>({cx - hx, cy - hy, cz - hz}, {cx + hx, cy + hy, cz + hz});
 }
 
-TEST(RsGeomInstance, KeepsItsAttributesAndLightSet) {
-    const auto mesh = makeBoxMesh({0, 0, 0}, {1, 1, 1});
-    for (int bits = 0; bits < 32; ++bits) {
-        SdInstanceAttributes a;
-        a._renderOrder = (bits - 16) * 1000003;
-        a._visible = bits & 1;
-        a._castsShadows = bits & 2;
-        a._receivesShadows = bits & 4;
-        a._drawFrontFaces = bits & 8;
-        a._drawBackFaces = bits & 16;
-        const RsGeomInstance i(GeAffineMatrix3<float>(), mesh, {}, {}, a, {3, 1, 3, 2, 1});
-        EXPECT_EQ(i._renderOrder, a._renderOrder);
-        EXPECT_EQ(
-            (std::vector<bool>{i._visible, i._castsShadows, i._receivesShadows, i._drawFrontFaces, i._drawBackFaces}),
-            (std::vector<bool>{a._visible, a._castsShadows, a._receivesShadows, a._drawFrontFaces, a._drawBackFaces}));
-        EXPECT_EQ(std::vector<unsigned int>(i._lights.begin(), i._lights.end()), (std::vector<unsigned int>{1, 2, 3}));
-    }
-}
 
 TEST(RsGeomInstance, WorldBoxHoldsTheTransformedCornersTightly) {
     std::mt19937 rng(1234);
