@@ -1,6 +1,6 @@
 #pragma once
-// The material shader of the zrender host, and the example of how a host extends the renderer
-// with a shader of its own.
+// The material shader of the zrender host and its own kind of material: the example of how a host
+// extends the renderer with a shader and a material of its own.
 //
 // A host derives from RsMaterialShader and answers four questions:
 // - shade: the colour of one fragment, from the shading context. Alpha is straight: the renderer
@@ -17,8 +17,24 @@
 // towards the viewer, so the inside of a transparent object is lit like its outside.
 #include "coRgbColorTyped.h"
 #include "rsMaterialShader.h"
+#include "rttiGenType.h"
+#include "sdMaterial.h"
 
 namespace Zr {
+
+// The host's own kind of material, which ZrDiffuseShader draws: a subtype of SdMaterial with a
+// run-time type of its own. A shader builder registered for that type in the scene registry makes
+// the shader wherever a scene builder meets such a material; its shadow shader is the standard
+// one, which the registry finds through the type's ancestor, SdMaterial.
+class ZrDiffuseMaterial : public SdMaterial {
+public:
+    // Registers the builder of ZrDiffuseShader for this type with the process's scene registry;
+    // later calls do nothing. Call it before building a scene that uses the material.
+    static void registerShaderBuilder();
+
+    using RttiClassType = RttiGenType1<ZrDiffuseMaterial, SdMaterial>;
+    const RttiType<SdMaterial>& getType() const override { return RttiClassType::getInstance(); }
+};
 
 class ZrDiffuseShader : public RsMaterialShader {
 public:

@@ -8,7 +8,7 @@
 #include "sdStdLight.h"
 #include "sdTexture.h"
 #include "sdTextureParams.h"
-#include "zrDiffuseMaterial.h"
+#include "zrDiffuseShader.h"
 #include "zrShapes.h"
 
 namespace Zr {
