@@ -1,11 +1,10 @@
 // The rasterizer: which samples it covers against the exact fill rule, triangle by triangle and
 // over fans whose triangles share edges, at whole-pixel and both sub-pixel grains; the pixel
-// data that reaches the buffer; the spans of sub-pixel rows; and the interrupt check once per
-// scanline, after which a cancel leaves the rasterizer as good as new.
+// data that reaches the buffer; the rows at which 8 x 4 spans arrive; and the interrupt check once
+// per scanline, after which a cancel leaves the rasterizer as good as new.
 #include <gtest/gtest.h>
 
 #include <array>
-#include <climits>
 #include <cmath>
 #include <random>
 #include <vector>
@@ -345,38 +344,6 @@ TYPED_TEST(RsRasterizerPixelData, AttributesAreLinearAtEveryPixelWhateverTheTili
 }
 
 // ---- How spans are handed over -------------------------------------------------------------------
-
-// Sub-pixel spans, one per pixel row: the sub-scanlines of the first and last rows that lie outside
-// the triangle hold -1 in both ends, all others are walked, and the four extents are the smallest
-// and largest ends of the walked ones.
-TEST(RsRasterizerSpans, SubPixelSpansMarkMissedSubScanlines) {
-    Harness<RsNormalVertex, RsPixelSpan<4, 4>> h({10, 40, 20, 44}, 1000, 1000);
-    h._buffer._keepDeliveries = true;
-    // Top at sub-row 5 of pixel row 2 (y = 22 + 5.5/16), bottom inside pixel row 9.
-    const Pt a{12 * u, 22 * u + 88}, b{35 * u + 3, 26 * u + 17}, c{20 * u + 9, 29 * u + 201};
-    h.draw(a, b, c);
-    const ReferenceTriangle ref = h.reference(a, b, c);
-    ASSERT_EQ(ref.rowBegin(), 2 * 16 + 5);
-    const int firstRow = int(ref.rowBegin() >> 4);
-    ASSERT_EQ(int(h._buffer._deliveries.size()), int((ref.rowEnd() - 1) >> 4) - firstRow + 1);
-    for (std::size_t i = 0; i < h._buffer._deliveries.size(); ++i) {
-        const auto& [row, span] = h._buffer._deliveries[i];
-        EXPECT_EQ(row, firstRow + int(i));
-        std::array<int, 4> extents{INT_MAX, INT_MIN, INT_MAX, INT_MIN};
-        for (int slot = 0; slot < 16; ++slot) {
-            const i64 subRow = i64(row) * 16 + slot;
-            if (subRow < ref.rowBegin() || subRow >= ref.rowEnd()) {
-                EXPECT_EQ(span._x1[slot], -1) << "row " << row << " slot " << slot;
-                EXPECT_EQ(span._x2[slot], -1) << "row " << row << " slot " << slot;
-                continue;
-            }
-            EXPECT_GE(span._x1[slot], 0);
-            extents = {std::min(extents[0], span._x1[slot]), std::max(extents[1], span._x1[slot]),
-                       std::min(extents[2], span._x2[slot]), std::max(extents[3], span._x2[slot])};
-        }
-        EXPECT_EQ((std::array<int, 4>{span._minX1, span._maxX1, span._minX2, span._maxX2}), extents);
-    }
-}
 
 // 8 x 4 spans come at the row that their last sub-scanline gives when shifted by the x bits, minus
 // the rows before it in the block: a one-row triangle at pixel row r arrives at row r / 2, where
