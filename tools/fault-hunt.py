@@ -105,7 +105,8 @@ def run_suite(build):
                           capture_output=True, text=True)
     if test.returncode == 0:
         return "escaped", ""
-    failed = re.findall(r"\d+ - (\S+) \(", test.stdout)
+    # Typed tests have spaces in their names: take the whole name up to ctest's closing verdict.
+    failed = re.findall(r"^\s*\d+ - (.+) \([^()]*\)\s*$", test.stdout, re.M)
     return "caught", " ".join(failed[:3]) + (" ..." if len(failed) > 3 else "")
 
 

@@ -49,6 +49,8 @@ TEST(RsPixelData, TrianglesWithoutAreaGetGradientsAlongTheirLongestEdge) {
         {"tie of edges 0 and 2 goes to 0", {0, 4, 4}, {0, 2, 2}, {1, 9, 5}, 2, 4},
         {"point", {3, 3, 3}, {5, 5, 5}, {7, 8, 9}, 0, 0},
         {"below the threshold", {0, 5e-154, 0}, {0, 0, 5e-154}, {7, 8, 9}, 0, 0},
+        // An edge whose squared length is the threshold exactly (2^-1017) still counts as a point.
+        {"at the threshold", {0, 0x1p-509, 0}, {0, 0x1p-509, 0}, {7, 8, 9}, 0, 0},
         {"above the threshold", {0, 1e-153, 0}, {0, 0, 1e-153}, {0, 1e-153, 0}, 1, 0, 0, 0, false},
     };
     for (const Case& c : cases) {
