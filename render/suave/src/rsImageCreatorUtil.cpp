@@ -30,10 +30,4 @@ void RsImageCreatorUtil::selectRowWriter(RowFunctions& table, const IxPixelForma
     table._writer = accumulate ? IxRowCodec::selectAddingWriter(format) : IxRowCodec::selectWriter(format);
 }
 
-RsImageCreatorUtil::RowWriter RsImageCreatorUtil::getReplacingRowWriter(const IxPixelFormat& format) {
-    RowFunctions table;
-    selectRowWriter(table, format, false);
-    return table._writer;
-}
-
 }  // namespace Zr

@@ -32,8 +32,6 @@ public:
     // Stores the replacing (accumulate false) or adding (accumulate true) writer of the format in
     // the table. A format outside the nine aborts.
     static void selectRowWriter(RowFunctions& table, const IxPixelFormat& format, bool accumulate);
-    // The replacing writer of the format, with the abort rules of selectRowWriter.
-    static RowWriter getReplacingRowWriter(const IxPixelFormat& format);
 
     RsImageCreatorUtil() = delete;
 };
