@@ -18,6 +18,7 @@
 #include "gePoint3.h"
 #include "rsGradientBlock.h"
 #include "rsInterpolant.h"
+#include "rsShadingContext.h"
 #include "rsVertices.h"
 
 namespace Zr {
@@ -78,7 +79,11 @@ struct RsPixelData : RsGradientBlock {
 
     // The planes of the triangle v0, v1, v2 (after the perspective division). origin is v0 relative
     // to the region origin, in pixels; _q is left at 0 until the data is placed.
-    RsPixelData(const GePoint2<double>& origin, const Vertex& v0, const Vertex& v1, const Vertex& v2)
+    // needed is the material's needed-context mask: the planes of the eye position and of the
+    // texture coordinates are set up only when it asks for them, and are zero otherwise, as
+    // nothing reads them then.
+    RsPixelData(const GePoint2<double>& origin, const Vertex& v0, const Vertex& v1, const Vertex& v2,
+                unsigned int needed = ~0u)
         : RsGradientBlock(static_cast<double>(v0.pixelX()), static_cast<double>(v0.pixelY()),
                           static_cast<double>(v1.pixelX()), static_cast<double>(v1.pixelY()),
                           static_cast<double>(v2.pixelX()), static_cast<double>(v2.pixelY())) {
@@ -92,12 +97,20 @@ struct RsPixelData : RsGradientBlock {
             _z.setupSlope();
         }
         if constexpr (kHasEyeZ) _eyeZ.setup(*this, v0._eyeZ, v1._eyeZ, v2._eyeZ, ox, oy);
-        if constexpr (kHasEyeCoord)
-            _eyeCoord.setup(*this, toFloat(v0._eyeCoord), toFloat(v1._eyeCoord), toFloat(v2._eyeCoord),
-                            oxf, oyf);
-        if constexpr (kHasTexCoord)
-            _texCoord.setup(*this, toPlane(v0._texCoord), toPlane(v1._texCoord), toPlane(v2._texCoord),
-                            ox, oy);
+        if constexpr (kHasEyeCoord) {
+            if ((needed & RsShadingContext::needsEyeCoord) != 0)
+                _eyeCoord.setup(*this, toFloat(v0._eyeCoord), toFloat(v1._eyeCoord), toFloat(v2._eyeCoord),
+                                oxf, oyf);
+            else
+                _eyeCoord = {};
+        }
+        if constexpr (kHasTexCoord) {
+            if ((needed & RsShadingContext::needsTexCoord) != 0)
+                _texCoord.setup(*this, toPlane(v0._texCoord), toPlane(v1._texCoord), toPlane(v2._texCoord),
+                                ox, oy);
+            else
+                _texCoord = {};
+        }
         if constexpr (kHasNormal)
             _normal.setup(*this, toFloat(v0._normal), toFloat(v1._normal), toFloat(v2._normal), oxf, oyf);
         if constexpr (kHasBinormal)

@@ -110,7 +110,7 @@ public:
             Edge upperEdge(top->x, top->y, middle->x, middle->y, yTop);
             if (upperEdge._dx_dy == longEdge._dx_dy) return;
             const bool longIsLeft = longEdge._dx_dy < upperEdge._dx_dy;
-            PixelData data(origin, v0, v1, v2);
+            PixelData data = makePixelData(context, origin, v0, v1, v2);
             startFirstSpan(yTop);
             if (longIsLeft) {
                 rasterizeHalfTriangle(context, yTop, yMiddle, longEdge, upperEdge, spanCount, data);
@@ -124,7 +124,7 @@ public:
             // Flat top: the two edges meet below, so the one with the larger slope is the left one.
             if (lowerEdge._dx_dy == longEdge._dx_dy) return;
             const bool longIsLeft = longEdge._dx_dy > lowerEdge._dx_dy;
-            PixelData data(origin, v0, v1, v2);
+            PixelData data = makePixelData(context, origin, v0, v1, v2);
             startFirstSpan(yTop);
             if (longIsLeft) {
                 rasterizeHalfTriangle(context, yMiddle, yBottom, longEdge, lowerEdge, spanCount, data);
@@ -178,6 +178,14 @@ public:
     // Delivers the spanCount stored spans, the last of which lies at lastRow (a sub-scanline on the
     // sub-pixel paths), column tile by column tile, each span clamped to its tile and the pixel
     // data placed at the span's first pixel.
+    // The pixel data of a triangle, told the material's needed-context mask where the drawing
+    // context carries one, so that it leaves out the planes nobody reads.
+    static PixelData makePixelData(const Context& context, const GePoint2<double>& origin, const Vertex& v0,
+                                   const Vertex& v1, const Vertex& v2) {
+        if constexpr (requires { context._needed; }) return PixelData(origin, v0, v1, v2, context._needed);
+        else return PixelData(origin, v0, v1, v2);
+    }
+
     void drawSpans(const Context& context, PixelData& data, int spanCount, int lastRow) const {
         PixelSpan* const spans = _spans.get();
         const int blockWidth = _blockWidth;
