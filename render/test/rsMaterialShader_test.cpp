@@ -3,8 +3,8 @@
 // folding of map weights are checked through the standard shaders that use them.
 #include <gtest/gtest.h>
 
-#include <random>
 #include <atomic>
+#include <random>
 #include <thread>
 #include <vector>
 
@@ -17,7 +17,6 @@ namespace {
 
 using namespace RsTest;
 using Params = RCShdPtr<const SdTextureParams>;
-using Rgb = CoRgbColorTyped<float>;
 
 Params makeMap(float weight, const Rgba& colour = {0.5f, 0.25f, 1.0f, 0.5f}) {
     return Params(makeShared<ConstantParams>(colour, weight));
