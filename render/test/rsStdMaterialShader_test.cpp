@@ -1,5 +1,6 @@
 // The standard, simple, no-shade and shadow shaders against one closed form at random frames, from
-// no more of the shading context than they ask for; the shadow matte against a table.
+// no more of the shading context than they ask for, and the standard one through the renderer on a
+// lit quad; the shadow matte against a table.
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -184,6 +185,35 @@ TEST(RsMaterialShaders, ShadeTheClosedFormAndReadTheirMapsWhereTheyPointAtRandom
             EXPECT_EQ(context._texCoord, maps[maps[3] ? 3 : 2]->_made->_lastTexCoord);
         }
     }
+}
+
+// A quad facing the camera under one directional light, through the renderer in perspective: at
+// every pixel the closed form at the point that the pixel centre sees.
+TEST(RsStdMaterialShader, FlatQuadThroughTheRendererMatchesTheClosedFormAtEveryPixel) {
+    const GeRectangle<int> rect{0, 64, 0, 48};
+    const GeProjectiveMatrix3<double> projection = perspective(1.0471975511965976, 0.5, 100.0);
+    RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
+    m->_emissive = {0.05f, 0.02f, 0.0f}, m->_ambient = {0.1f, 0.2f, 0.3f}, m->_diffuse = {0.5f, 0.4f, 0.3f};
+    m->_specular = {0.3f, 0.3f, 0.2f}, m->_shininess = 0.4f;
+    const RsScene::LightList lights{
+        makeShared<StubLight>(V3f(0.3f, 0.2f, 0.9f).getNormalized(), Rgb(0.9f, 0.8f, 0.7f), Rgb(0.3f, 0.3f, 0.3f))};
+    const auto shader = makeShared<RsStdMaterialShader>(m);
+    const RCShdPtr<RsGeomInstance> quad = makeInstance(
+        makeMesh({{-3, -3, -2}, {3, -3, -2}, {3, 3, -2}, {-3, 3, -2}}, {0, 1, 2, 0, 2, 3}), {}, {}, {shader});
+    RCShdPtr<RsScene> scene = makeScene({quad}, lights);
+    RCShdPtr<const RsGeomInstance> instance = quad;
+    shader->initialize(scene, instance);
+    Picture picture(rect);
+    render(scene, projection, rect, picture);
+    for (int py = rect.y0; py < rect.y1; ++py)
+        for (int px = rect.x0; px < rect.x1; ++px) {
+            const D3 v = D3(-(px + 0.5 - 32) / 32 / projection(0, 0), -(py + 0.5 - 24) / 24 / projection(1, 1), 1)
+                             .getNormalized();
+            const Rgba got = picture.at(px, py);
+            for (int k = 0; k < 4; ++k)
+                EXPECT_NEAR(channelOf(got, k), closedForm(standard, *m, {0, 0, 1}, v, lights, {}, k), 1e-4)
+                    << px << ", " << py << " channel " << k;
+        }
 }
 
 // The matte per channel: the smaller of the summed shadow of the linked lights times the strength
