@@ -111,8 +111,10 @@ bool RsStdLightShader::illuminateFacing(const RsShadingContext& context, float f
     const SdStdLight& light = *_light;
     float strength = light._intensity;
     if (facing <= 0.0f) {
-        if (_emitAmbient)
-            illumination._ambient = applyDecay(distance, strength) ? light._color * strength : CoRgbColorTyped<float>(0.0f);
+        if (_emitAmbient) {
+            const bool reaches = applyDecay(distance, strength);
+            illumination._ambient = reaches ? light._color * strength : CoRgbColorTyped<float>(0.0f);
+        }
         return false;
     }
     if (!applyDecay(distance, strength)) return false;
