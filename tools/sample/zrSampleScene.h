@@ -25,8 +25,9 @@ public:
     // The description's geometry without lights, each material shaded by a shader of shaderMaker.
     static RCShdPtr<RsScene> makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker =
                                                 ZrSceneKit::diffuseShaderMaker());
-    // The camera for a picture of width by height pixels.
-    static RCShdPtr<SdInstance> makeCamera(int width, int height);
+    // The camera for a picture of width by height pixels, at the given time of the scene's
+    // animation: the camera circles the scene once in eight seconds, from the front at time 0.
+    static RCShdPtr<SdInstance> makeCamera(int width, int height, double seconds = 0.0);
 };
 
 }  // namespace Zr

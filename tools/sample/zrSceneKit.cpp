@@ -55,15 +55,19 @@ RCShdPtr<SdInstance> ZrSceneKit::makeCamera(const GePoint3<double>& eye, const G
     return makeShared<SdInstance>(camera, makeLookAt(eye, target));
 }
 
-GeAffineMatrix3<float> ZrSceneKit::makeLookAt(const GePoint3<double>& eye, const GePoint3<double>& target) {
+GeAffineMatrix3<float> ZrSceneKit::makeLookAt(const GePoint3<double>& eye, const GePoint3<double>& target,
+                                               const GeVector3<double>& up) {
     // The eye looks down its -z axis, so its z axis points from the target back to the eye; x is
     // to the right of the view and y completes the frame.
     const GeVector3<double> back = (eye - target).getNormalized();
-    const GeVector3<double> right = GeVector3<double>(0, 1, 0).cross(back).getNormalized();
-    const GeVector3<double> up = back.cross(right);
-    const GeAffineMatrix3<double> eyeToWorld(right.x, up.x, back.x, eye.x,  //
-                                             right.y, up.y, back.y, eye.y,  //
-                                             right.z, up.z, back.z, eye.z);
+    GeVector3<double> right = up.cross(back);
+    if (right.length() < 1e-9 * up.length()) right = GeVector3<double>(1, 0, 0).cross(back);
+    if (right.length() < 1e-9) right = GeVector3<double>(0, 0, 1).cross(back);
+    right = right.getNormalized();
+    const GeVector3<double> viewUp = back.cross(right);
+    const GeAffineMatrix3<double> eyeToWorld(right.x, viewUp.x, back.x, eye.x,  //
+                                             right.y, viewUp.y, back.y, eye.y,  //
+                                             right.z, viewUp.z, back.z, eye.z);
     return GeAffineMatrix3<float>(eyeToWorld);
 }
 

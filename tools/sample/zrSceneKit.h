@@ -46,10 +46,12 @@ public:
     static RCShdPtr<SdInstance> makeCamera(const GePoint3<double>& eye, const GePoint3<double>& target,
                                            double fieldOfViewDegrees, double aspect, float nearPlane, float farPlane);
 
-    // The frame of an eye at eye looking at target with world +y up, as the matrix from its own
-    // space to the world: its -z axis points at the target, as cameras, spot lights and direct
-    // lights look. Computed in double precision and rounded once to float.
-    static GeAffineMatrix3<float> makeLookAt(const GePoint3<double>& eye, const GePoint3<double>& target);
+    // The frame of an eye at eye looking at target, with up (world +y unless given) pointing up in
+    // the view, as the matrix from its own space to the world: its -z axis points at the target, as
+    // cameras, spot lights and direct lights look. An up along the line of sight is replaced by
+    // another axis. Computed in double precision and rounded once to float.
+    static GeAffineMatrix3<float> makeLookAt(const GePoint3<double>& eye, const GePoint3<double>& target,
+                                             const GeVector3<double>& up = {0, 1, 0});
 
     // A placement: scaled evenly by scale, turned by angleDegrees about axis, then moved to
     // position. Computed in double precision and rounded once to float.

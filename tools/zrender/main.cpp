@@ -1,78 +1,116 @@
-// zrender: the command-line host of libZRrender. It builds the sample scene, renders it with
-// RsRenderer into an 8-bit RGBA tile, and writes the picture as a PNG or compares it with a
-// reference picture.
+// zrender: the command-line host of libZRrender. It renders a model file (through Assimp) or the
+// built-in sample scene, on several threads, one picture per frame, and writes each picture to an
+// image file (through OpenImageIO) or compares it with a reference picture.
+//
+// Exit status: 0 done, 1 a failure (one line on standard error naming the file and the reason),
+// 2 a usage error, 130 cancelled by Ctrl-C (no file written).
+#include <unistd.h>
+
 #include <exception>
 #include <iostream>
+#include <memory>
 #include <string>
-#include <vector>
 
 #include "exBase.h"
-#include "ixTile.h"
-#include "ixWriteGuard.h"
-#include "rsRenderer.h"
-#include "zrCommandLine.h"
-#include "zrImage.h"
+#include "exRenderCancelled.h"
+#include "pxRequestMgr.h"
+#include "rsSceneBuilder.h"
+#include "zrHostError.h"
+#include "zrImageFile.h"
 #include "zrInfoReport.h"
-#include "zrPngFile.h"
+#include "zrModelFile.h"
+#include "zrOptions.h"
+#include "zrRenderProgress.h"
 #include "zrSampleScene.h"
+#include "zrTileRenderer.h"
 
 namespace {
 
 using namespace Zr;
 
-// The sample scene as the command line asks for it.
-ZrImage renderSample(const ZrCommandLine& commandLine) {
-    RCShdPtr<RsRenderer> renderer = makeShared<RsRenderer>();
-    renderer->setZBuffer(commandLine.zBuffer);
-    renderer->setFillColor(commandLine.fill);
+constexpr int kCancelledStatus = 130;
 
-    const GeRectangle<int> rectangle{0, commandLine.width, 0, commandLine.height};
-    IxTile tile(IxPixelFormat(IxPixelFormat::RGBA, IxPixelFormat::UINT8), rectangle, {0.0f, 0.0f, 0.0f, 0.0f});
-    renderer->render(ZrSampleScene::makeCamera(commandLine.width, commandLine.height), ZrSampleScene::makeScene(),
-                     rectangle, IxWriteGuard(tile));
-    return ZrImage::fromTile(tile);
-}
+// Keeps the progress handler installed for the renders of one run.
+class InstalledHandler {
+public:
+    explicit InstalledHandler(const RCShdPtr<ZrRenderProgress>& progress) {
+        PxRequestMgr::getInstance()->setInterruptHandler(progress);
+    }
+    ~InstalledHandler() { PxRequestMgr::getInstance()->setInterruptHandler({}); }
+    InstalledHandler(const InstalledHandler&) = delete;
+    InstalledHandler& operator=(const InstalledHandler&) = delete;
+};
 
-// Writes and compares as asked; the exit status.
-int run(const ZrCommandLine& commandLine) {
-    const ZrImage picture = renderSample(commandLine);
-    if (commandLine.compare.empty() || commandLine.outputGiven) ZrPngFile::write(commandLine.output, picture);
-    if (commandLine.compare.empty()) return 0;
+// Renders the frames the options ask for and writes or compares each; the exit status.
+int run(const ZrOptions& options) {
+    std::unique_ptr<ZrModelFile> model;
+    if (!options.model.empty()) {
+        model = std::make_unique<ZrModelFile>(options.model);
+        for (const std::string& warning : model->warnings()) std::cerr << "zrender: warning: " << warning << '\n';
+    }
+    const ZrImageFile::Storage storage = ZrImageFile::storageFor(options.output, options.floatPixels);
+    ZrRenderSettings settings;
+    settings.zBuffer = options.zBuffer;
+    settings.fill = options.fill;
+    settings.floatPixels = storage != ZrImageFile::Storage::uint8;
+    settings.threads = options.threads;
+    settings.tileSize = options.tileSize;
 
-    const ZrImage::Difference difference = ZrImage::compare(picture, ZrPngFile::read(commandLine.compare));
-    std::cout << commandLine.compare << ": " << difference << '\n';
-    return difference.any() ? 1 : 0;
+    RCShdPtr<ZrRenderProgress> progress = makeShared<ZrRenderProgress>(isatty(STDERR_FILENO) == 1);
+    const InstalledHandler installed(progress);
+    const double aspect = static_cast<double>(options.width) / options.height;
+    int status = 0;
+    for (int frame = options.firstFrame; frame <= options.lastFrame; ++frame) {
+        const double seconds = options.framesGiven ? frame / options.framesPerSecond : 0.0;
+        const RCShdPtr<SdScene> description = model ? model->sceneAt(seconds) : ZrSampleScene::makeDescription();
+        const RCShdPtr<SdInstance> camera = model ? model->cameraAt(options.camera, seconds, aspect)
+                                                  : ZrSampleScene::makeCamera(options.width, options.height, seconds);
+        const auto makeScene = [&description] {
+            RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
+            builder->addScene(description);
+            return builder->createRendererScene();
+        };
+        progress->startFrame(frame - options.firstFrame + 1, options.frameCount(),
+                             ZrTileRenderer::tileCount(options.width, options.height, options.tileSize));
+        const OIIO::ImageBuf picture =
+            ZrTileRenderer::render(makeScene, camera, options.width, options.height, settings, progress.get());
+        progress->finish();
+        // Ctrl-C after the last scanline still cancels: nothing is written.
+        if (ZrRenderProgress::interrupted()) throw ExRenderCancelled();
+
+        if (options.compare.empty() || options.outputGiven)
+            ZrImageFile::write(options.outputOfFrame(frame), picture, storage);
+        if (!options.compare.empty()) {
+            const ZrImageFile::Difference difference =
+                ZrImageFile::compare(picture, ZrImageFile::read(options.compare), options.tolerance);
+            std::cout << options.compare << ": " << difference.describe() << '\n';
+            if (difference.any()) status = 1;
+        }
+    }
+    return status;
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
-    const std::string programName = argc > 0 ? argv[0] : "zrender";
-    const std::vector<std::string> arguments(argv + (argc > 0 ? 1 : 0), argv + argc);
-
-    ZrCommandLine commandLine;
-    std::string error;
-    if (!ZrCommandLine::parse(arguments, commandLine, error)) {
-        std::cerr << programName << ": " << error << '\n';
-        ZrCommandLine::printUsage(std::cerr, programName);
-        return 2;
-    }
-    if (commandLine.help) {
-        ZrCommandLine::printUsage(std::cout, programName);
+    ZrOptions options;
+    const int parsed = ZrOptions::parse(argc, argv, options);
+    if (parsed >= 0) return parsed;
+    if (options.info) {
+        ZrInfoReport::print(std::cout);
         return 0;
     }
 
+    ZrRenderProgress::catchInterrupts();
     try {
-        if (commandLine.info) {
-            ZrInfoReport::print(std::cout);
-            return 0;
-        }
-        return run(commandLine);
+        return run(options);
+    } catch (const ExRenderCancelled&) {
+        std::cerr << "zrender: render cancelled\n";
+        return kCancelledStatus;
     } catch (const ExBase& e) {
-        std::cerr << programName << ": " << e.what() << '\n';
-        return 1;
+        std::cerr << "zrender: " << e.what() << '\n';
     } catch (const std::exception& e) {
-        std::cerr << programName << ": " << e.what() << '\n';
-        return 1;
+        std::cerr << "zrender: " << e.what() << '\n';
     }
+    return ZrRenderProgress::interrupted() ? kCancelledStatus : 1;
 }

@@ -1,0 +1,145 @@
+#include "zrOptions.h"
+
+#include <charconv>
+#include <iostream>
+#include <thread>
+#include <vector>
+
+#include <CLI/CLI.hpp>
+
+namespace Zr {
+
+namespace {
+
+constexpr int maxSide = 16384;
+
+// A whole string as one number of type T; false if anything is left over.
+template <class T>
+bool parseNumber(const std::string& text, std::size_t first, std::size_t last, T& value) {
+    const std::from_chars_result result = std::from_chars(text.data() + first, text.data() + last, value);
+    return first < last && result.ec == std::errc() && result.ptr == text.data() + last;
+}
+
+void parseSize(const std::string& text, ZrOptions& o) {
+    const std::size_t x = text.find('x');
+    if (x == std::string::npos || !parseNumber(text, 0, x, o.width) ||
+        !parseNumber(text, x + 1, text.size(), o.height) || o.width < 1 || o.height < 1 || o.width > maxSide ||
+        o.height > maxSide)
+        throw CLI::ValidationError("--size", "takes WIDTHxHEIGHT, each from 1 to " + std::to_string(maxSide) +
+                                                 ", not " + text);
+}
+
+void parseFill(const std::string& text, ZrOptions& o) {
+    std::vector<float> channels;
+    for (std::size_t start = 0;;) {
+        const std::size_t end = std::min(text.find(',', start), text.size());
+        float value = 0.0f;
+        if (!parseNumber(text, start, end, value) || channels.size() == 4) {
+            channels.clear();
+            break;
+        }
+        channels.push_back(value);
+        if (end == text.size()) break;
+        start = end + 1;
+    }
+    if (channels.size() < 3) throw CLI::ValidationError("--fill", "takes r,g,b or r,g,b,a, not " + text);
+    if (channels.size() == 3) channels.push_back(1.0f);
+    o.fill = {channels[0], channels[1], channels[2], channels[3]};
+}
+
+void parseFrames(const std::string& text, ZrOptions& o) {
+    const std::size_t dash = text.find('-', 1);
+    const bool ok = dash == std::string::npos
+                        ? parseNumber(text, 0, text.size(), o.firstFrame) && (o.lastFrame = o.firstFrame, true)
+                        : parseNumber(text, 0, dash, o.firstFrame) &&
+                              parseNumber(text, dash + 1, text.size(), o.lastFrame);
+    if (!ok || o.firstFrame < 0 || o.lastFrame < o.firstFrame || o.lastFrame - o.firstFrame >= 1000000)
+        throw CLI::ValidationError("--frames", "takes FIRST-LAST or one frame, 0 <= FIRST <= LAST, not " + text);
+    o.framesGiven = true;
+}
+
+}  // namespace
+
+int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
+    const unsigned cores = std::thread::hardware_concurrency();
+    o.threads = cores > 0 ? static_cast<int>(cores) : 1;
+
+    CLI::App app{"zrender: renders a model file (or, without one, the built-in sample scene) with libZRrender "
+                 "and writes the picture to an image file.",
+                 "zrender"};
+    app.get_formatter()->column_width(30);
+    app.add_option("model", o.model, "a model file in any format that Assimp reads (OBJ, glTF, PLY, FBX, ...)");
+    app.add_option("-o,--output", o.output,
+                   "the picture's file; its extension picks the format (png, jpg, tif, exr, ...). With "
+                   "--frames, a pattern such as out.####.exr (default zrender.png)")
+        ->type_name("FILE");
+    app.add_option_function<std::string>("--size", [&o](const std::string& v) { parseSize(v, o); },
+                                         "picture size in pixels (default 640x480)")
+        ->type_name("WxH");
+    app.add_option("--camera", o.camera, "the model file's camera to look through (default: its first, or "
+                                         "one that frames the model)")
+        ->type_name("NAME");
+    app.add_option("-j,--threads", o.threads, "render on N threads (default: one per core)")
+        ->type_name("N")
+        ->check(CLI::Range(1, 256));
+    app.add_option("--tile-size", o.tileSize, "side of the square tiles shared out to the threads (default 128)")
+        ->type_name("N")
+        ->check(CLI::Range(8, 4096));
+    app.add_option_function<std::string>("--frames", [&o](const std::string& v) { parseFrames(v, o); },
+                                         "render the frames FIRST to LAST of the animation (the model file's "
+                                         "first, or the sample scene's orbit), one file each")
+        ->type_name("FIRST-LAST");
+    app.add_option("--fps", o.framesPerSecond, "frames per second of the animation (default 24)")
+        ->type_name("F")
+        ->check(CLI::Range(0.001, 100000.0));
+    app.add_flag("--float", o.floatPixels, "float pixels (OpenEXR: 32-bit float instead of half; TIFF: float)");
+    app.add_flag("--no-zbuffer{false}", o.zBuffer, "no depth test: what is drawn later lies in front");
+    app.add_option_function<std::string>("--fill", [&o](const std::string& v) { parseFill(v, o); },
+                                         "colour where no surface is, straight, 0 to 1 (default 0.16,0.18,0.23,1)")
+        ->type_name("R,G,B[,A]");
+    app.add_option("--compare", o.compare,
+                   "compare the picture with the image FILE; exit 1 if they differ (writes no picture unless "
+                   "--output is given)")
+        ->type_name("FILE");
+    app.add_option("--tolerance", o.tolerance, "largest difference of a channel, 0 to 1, that --compare "
+                                               "accepts (default 0: exact)")
+        ->type_name("T")
+        ->check(CLI::Range(0.0f, 1.0f));
+    app.add_flag("--info", o.info, "print the library's package records and build record, and exit");
+
+    try {
+        app.parse(argc, argv);
+        o.outputGiven = app.count("--output") > 0;
+        if (o.frameCount() > 1 && o.output.find('#') == std::string::npos)
+            throw CLI::ValidationError("--output", "needs a # pattern, such as out.####.png, for several frames");
+        if (!o.compare.empty() && o.frameCount() > 1)
+            throw CLI::ValidationError("--compare", "compares one frame, not " + std::to_string(o.frameCount()));
+    } catch (const CLI::CallForHelp& e) {
+        return app.exit(e);
+    } catch (const CLI::ParseError& e) {
+        std::string message = e.what();
+        for (char& c : message) if (c == '\n') c = ' ';
+        std::cerr << "zrender: " << message << " (zrender --help lists the options)\n";
+        return 2;
+    }
+    return -1;
+}
+
+std::string ZrOptions::outputOfFrame(int frame) const {
+    std::string name;
+    for (std::size_t i = 0; i < output.size();) {
+        if (output[i] != '#') {
+            name += output[i++];
+            continue;
+        }
+        std::size_t run = 0;
+        while (i + run < output.size() && output[i + run] == '#') ++run;
+        std::string number = std::to_string(frame);
+        if (number.size() < run) number.insert(0, run - number.size(), '0');
+        name += number;
+        i += run;
+    }
+    return name;
+}
+
+}  // namespace Zr
