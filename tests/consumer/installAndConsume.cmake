@@ -12,6 +12,14 @@ function(run_step)
 endfunction()
 
 run_step(${CMAKE_COMMAND} --install ${BUILD_DIR} --prefix ${prefix})
+# The installed zrender starts from the prefix with no environment set: it finds the library
+# through its own run path.
+if(EXISTS ${prefix}/bin/zrender)
+  run_step(${CMAKE_COMMAND} -E env --unset=LD_LIBRARY_PATH ${prefix}/bin/zrender --size 32x24 -o ${WORK_DIR}/installed.png)
+  if(NOT EXISTS ${WORK_DIR}/installed.png)
+    message(FATAL_ERROR "the installed zrender wrote no picture")
+  endif()
+endif()
 run_step(${CMAKE_COMMAND} -S ${PROJECT_DIR} -B ${WORK_DIR}/build -G ${GENERATOR}
          -DCMAKE_PREFIX_PATH=${prefix} "-DCMAKE_CXX_FLAGS=${CXX_FLAGS}"
          "-DCMAKE_EXE_LINKER_FLAGS=${LINKER_FLAGS}")

@@ -1,6 +1,10 @@
 #include "zrModelFile.h"
 
+#include <fcntl.h>
+#include <unistd.h>
+
 #include <algorithm>
+#include <cstdio>
 #include <cmath>
 #include <filesystem>
 #include <map>
@@ -91,6 +95,38 @@ Colour colourOf(const aiMaterial& material, const char* key, unsigned int type, 
     if (material.Get(key, type, index, c) != AI_SUCCESS || !std::isfinite(c.r + c.g + c.b)) return fallback;
     return {c.r, c.g, c.b};
 }
+
+// Some of the importer's parsers print their complaints to the standard streams on their own;
+// the reason a file is refused comes back through the importer's error string, so while it reads,
+// what it prints goes nowhere and the user sees one line.
+class QuietStandardStreams {
+public:
+    QuietStandardStreams() {
+        std::fflush(stdout);
+        std::fflush(stderr);
+        const int null = ::open("/dev/null", O_WRONLY | O_CLOEXEC);
+        if (null < 0) return;
+        _saved[0] = ::dup(STDOUT_FILENO);
+        _saved[1] = ::dup(STDERR_FILENO);
+        ::dup2(null, STDOUT_FILENO);
+        ::dup2(null, STDERR_FILENO);
+        ::close(null);
+    }
+    ~QuietStandardStreams() {
+        std::fflush(stdout);
+        std::fflush(stderr);
+        for (int i = 0; i < 2; ++i) {
+            if (_saved[i] < 0) continue;
+            ::dup2(_saved[i], i == 0 ? STDOUT_FILENO : STDERR_FILENO);
+            ::close(_saved[i]);
+        }
+    }
+    QuietStandardStreams(const QuietStandardStreams&) = delete;
+    QuietStandardStreams& operator=(const QuietStandardStreams&) = delete;
+
+private:
+    int _saved[2] = {-1, -1};
+};
 
 }  // namespace
 
@@ -252,9 +288,12 @@ ZrModelFile::ZrModelFile(const std::string& path) : _model(std::make_unique<Mode
     if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file");
     // Points and lines are sorted into meshes of their own and dropped: only triangles are drawn.
     model.importer.SetPropertyInteger(AI_CONFIG_PP_SBP_REMOVE, aiPrimitiveType_POINT | aiPrimitiveType_LINE);
-    model.scene = model.importer.ReadFile(
-        path, aiProcess_Triangulate | aiProcess_JoinIdenticalVertices | aiProcess_SortByPType |
-                  aiProcess_ValidateDataStructure | aiProcess_FindInvalidData | aiProcess_FindDegenerates);
+    {
+        const QuietStandardStreams quiet;
+        model.scene = model.importer.ReadFile(
+            path, aiProcess_Triangulate | aiProcess_JoinIdenticalVertices | aiProcess_SortByPType |
+                      aiProcess_ValidateDataStructure | aiProcess_FindInvalidData | aiProcess_FindDegenerates);
+    }
     if (model.scene == nullptr || model.scene->mRootNode == nullptr)
         throw ZrHostError(path + ": " + oneLine(model.importer.GetErrorString()));
     const aiScene& scene = *model.scene;

@@ -11,4 +11,10 @@ golden="$root/tools/zrender/golden"
 # Large enough for eight regions, so that what crosses region borders is compared too.
 "$build/tools/zrender" --size 400x300 -o "$golden/sample-400x300.png"
 "$build/tools/zrender" --size 400x300 --no-zbuffer -o "$golden/sample-400x300-no-zbuffer.png"
-echo "wrote the four pictures sample-*.png in $golden"
+
+# Real model files from the assimp-testmodels package: OBJ with textures, glTF 2.0 and PLY.
+models=/usr/share/assimp/models
+"$build/tools/zrender" "$models/OBJ/spider.obj" --size 160x120 -o "$golden/model-spider-obj.png"
+"$build/tools/zrender" "$models/glTF2/BoxTextured-glTF/BoxTextured.gltf" --size 160x120 -o "$golden/model-box-gltf.png"
+"$build/tools/zrender" "$models/PLY/Wuson.ply" --size 160x120 -o "$golden/model-wuson-ply.png"
+echo "wrote the three pictures model-*.png in $golden"
