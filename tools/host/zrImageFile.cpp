@@ -68,6 +68,10 @@ ZrImageFile::Storage ZrImageFile::storageFor(const std::string& path, bool wantF
     if (extension.empty()) throw ZrHostError(path + ": the output needs an extension that names its format");
     std::unique_ptr<OIIO::ImageOutput> output = OIIO::ImageOutput::create(path);
     if (!output) throw ZrHostError(path + ": no image format writes \"" + extension + "\" files");
+    std::error_code error;
+    const std::filesystem::path folder = std::filesystem::path(path).parent_path();
+    if (!folder.empty() && !std::filesystem::is_directory(folder, error))
+        throw ZrHostError(path + ": no such folder " + folder.string());
     if (extension == ".exr") return wantFloat ? Storage::float32 : Storage::half;
     if (!wantFloat) return Storage::uint8;
     if (extension == ".tif" || extension == ".tiff") return Storage::float32;
@@ -115,7 +119,7 @@ void ZrImageFile::write(const std::string& path, const OIIO::ImageBuf& picture, 
 
 OIIO::ImageBuf ZrImageFile::read(const std::string& path) {
     std::error_code error;
-    if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file");
+    if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file (or not a file)");
     const OIIO::ImageSpec config = unassociatedConfig();
     OIIO::ImageBuf file(path, 0, 0, nullptr, &config);
     OIIO::ImageBuf picture;
@@ -149,7 +153,7 @@ std::string ZrImageFile::Difference::describe() const {
 
 RCShdPtr<SdTexture> ZrImageFile::readTexture(const std::string& path) {
     std::error_code error;
-    if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file");
+    if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file (or not a file)");
     const OIIO::ImageSpec config = unassociatedConfig();
     return readTextureFrom(OIIO::ImageInput::open(path, &config), path);
 }

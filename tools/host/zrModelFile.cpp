@@ -285,7 +285,7 @@ ZrModelFile::ZrModelFile(const std::string& path) : _model(std::make_unique<Mode
     Model& model = *_model;
     model.path = path;
     std::error_code error;
-    if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file");
+    if (!std::filesystem::is_regular_file(path, error)) throw ZrHostError(path + ": no such file (or not a file)");
     // Points and lines are sorted into meshes of their own and dropped: only triangles are drawn.
     model.importer.SetPropertyInteger(AI_CONFIG_PP_SBP_REMOVE, aiPrimitiveType_POINT | aiPrimitiveType_LINE);
     {

@@ -49,6 +49,8 @@ int run(const ZrOptions& options) {
         for (const std::string& warning : model->warnings()) std::cerr << "zrender: warning: " << warning << '\n';
     }
     const ZrImageFile::Storage storage = ZrImageFile::storageFor(options.output, options.floatPixels);
+    // The reference is read before the render, so that a missing one costs no time.
+    const OIIO::ImageBuf reference = options.compare.empty() ? OIIO::ImageBuf() : ZrImageFile::read(options.compare);
     ZrRenderSettings settings;
     settings.zBuffer = options.zBuffer;
     settings.fill = options.fill;
@@ -82,7 +84,7 @@ int run(const ZrOptions& options) {
             ZrImageFile::write(options.outputOfFrame(frame), picture, storage);
         if (!options.compare.empty()) {
             const ZrImageFile::Difference difference =
-                ZrImageFile::compare(picture, ZrImageFile::read(options.compare), options.tolerance);
+                ZrImageFile::compare(picture, reference, options.tolerance);
             std::cout << options.compare << ": " << difference.describe() << '\n';
             if (difference.any()) status = 1;
         }
