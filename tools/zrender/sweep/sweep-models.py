@@ -31,11 +31,18 @@ def model_files(folder):
                 yield os.path.join(root, name)
 
 
+# Under LeakSanitizer, leaks inside the importer library on its refusal paths are not ours.
+SUPPRESSIONS = os.path.join(os.path.dirname(os.path.abspath(__file__)), "lsan-importer.supp")
+ENVIRONMENT = dict(os.environ, LSAN_OPTIONS=":".join(
+    filter(None, [os.environ.get("LSAN_OPTIONS"), "suppressions=" + SUPPRESSIONS, "print_suppressions=0"])))
+
+
 def render(zrender, path, timeout, out_dir):
     output = os.path.join(out_dir, "%d.png" % (abs(hash(path)) % 10**12))
     try:
         done = subprocess.run([zrender, path, "--size", "48x36", "--threads", "1", "-o", output],
-                              capture_output=True, text=True, errors="replace", timeout=timeout)
+                              capture_output=True, text=True, errors="replace", timeout=timeout,
+                              env=ENVIRONMENT)
     except subprocess.TimeoutExpired:
         return path, "broken", "no answer within %d s" % timeout
     finally:
@@ -43,7 +50,8 @@ def render(zrender, path, timeout, out_dir):
             os.remove(output)
     errors = [line for line in done.stderr.splitlines() if not line.startswith("zrender: warning: ")]
     if any(mark in done.stderr for mark in SANITIZER_MARKS):
-        return path, "broken", "sanitizer report: " + done.stderr.strip().splitlines()[0]
+        report = [line for line in done.stderr.splitlines() if any(mark in line for mark in SANITIZER_MARKS)]
+        return path, "broken", "sanitizer report: " + report[0]
     if done.returncode == 0 and not errors:
         return path, "rendered", ""
     if done.returncode == 1 and len(errors) == 1 and errors[0].startswith("zrender: "):
