@@ -1,6 +1,6 @@
 #include "rsFZBufferFactory.h"
 
-#include "assertions.h"
+#include "rsDeepShadowMap.h"
 
 namespace Zr {
 
@@ -18,11 +18,9 @@ GeRectangle<int> RsFZBufferFactory::getPixelRegion() const {
     return _output._rectangle;
 }
 
-// The region of the deep shadow map needs the map's own class, which this build does not have
-// yet: until it comes, a factory directed at a map stops here. Setting a map as output is
-// harmless by itself.
 GeRectangle<int> RsFZBufferFactory::getDeepShadowMapRegion() const {
-    Assertions::throwProgramAborted(kSourceFile, __LINE__, "deep shadow map output is not available");
+    const int size = static_cast<int>(_deepShadowMap->getSize());
+    return {0, size, 0, size};
 }
 
 RCShdPtr<RsFZBuffer> RsFZBufferFactory::createBuffer(const GeRectangle<int>& region) const {

@@ -1,0 +1,103 @@
+#include "rsShadowPass.h"
+
+#include "geFrustum.h"
+#include "geRectangle.h"
+#include "rsCullAndSort.h"
+#include "rsDeepShadowMap.h"
+#include "rsFZBufferFactory.h"
+#include "rsMZBufferFactory.h"
+#include "rsScene.h"
+#include "rsSceneRenderer.h"
+#include "rsZBufferFactory.h"
+
+namespace Zr {
+
+namespace {
+
+// The depth of the farthest corner beyond the light, added to the far distance so that the
+// farthest surface stays inside the depth range.
+constexpr double kFarMargin = 0.0001;
+// The near distance as a part of the far one, where the scene reaches up to the light.
+constexpr double kNearToFar = 0.0001;
+
+// One pass: the casters that the frustum of projection admits, drawn into the factory's whole
+// pixel region.
+template <class Factory>
+void renderPass(Factory& factory, const GeAffineMatrix3<float>& worldToMap, const GeProjectiveMatrix3<float>& projection,
+                const RCShdPtr<RsScene>& scene) {
+    RsSceneRenderer<Factory> renderer(factory);
+    renderer.setup(worldToMap, GeProjectiveMatrix3<double>(projection), factory.getPixelRegion());
+    RsGeomInstanceList casters;
+    const GeFrustum<double> frustum(renderer.getProjection());
+    cullAndSortShadowCasters(scene, frustum, worldToMap, casters);
+    renderer.renderShadowPass(casters);
+}
+
+}  // namespace
+
+void RsShadowPass::renderDepthMap(SdStdLight::ShadowMapType type, double* map, int size,
+                                  const GeAffineMatrix3<float>& worldToMap,
+                                  const GeProjectiveMatrix3<float>& projection, const RCShdPtr<RsScene>& scene) {
+    if (type == SdStdLight::ShadowMapType::ShadowMapMidpoint) {
+        RsMZBufferFactory factory;
+        factory.setOutput(size, size, map);
+        renderPass(factory, worldToMap, projection, scene);
+    } else {
+        RsZBufferFactory factory;
+        factory.setOutput(size, size, map);
+        renderPass(factory, worldToMap, projection, scene);
+    }
+}
+
+void RsShadowPass::renderDeepMap(RsDeepShadowMap& map, const RCShdPtr<RsScene>& scene) {
+    RsFZBufferFactory factory;
+    factory.setOutput(map);
+    renderPass(factory, map.getWorldToShadowMapMatrix(), map.getProjectionMatrix(), scene);
+}
+
+bool RsShadowPass::fitDeepProjection(const GeAffineMatrix3<float>& worldToLight, const GeScale3<float>& scale,
+                                     bool perspective, const RsScene& scene, GeProjectiveMatrix3<float>& projection) {
+    const GeAlignedBox3<float> box = computeSceneBox(scene);
+    if (box.isEmpty()) return false;
+    // The light looks down its negative z axis: the corner farthest along that direction has the
+    // smallest light z, the nearest the largest.
+    const GeVector3<float> zRow(worldToLight(2, 0), worldToLight(2, 1), worldToLight(2, 2));
+    const GePoint3<float> farCorner(zRow.x < 0.0f ? box.xMax : box.xMin, zRow.y < 0.0f ? box.yMax : box.yMin,
+                                    zRow.z < 0.0f ? box.zMax : box.zMin);
+    const GePoint3<float> nearCorner(zRow.x > 0.0f ? box.xMax : box.xMin, zRow.y > 0.0f ? box.yMax : box.yMin,
+                                     zRow.z > 0.0f ? box.zMax : box.zMin);
+    const double zFar = worldToLight.transformPoint(farCorner).z;
+    const double zNear = worldToLight.transformPoint(nearCorner).z;
+    // A scene wholly at or behind the light's plane has nothing in front of the light: no pass.
+    if (!(zFar < 0.0)) return false;
+    const float far = static_cast<float>(-zFar + kFarMargin);
+    const float near = std::max(static_cast<float>(-zFar * kNearToFar), static_cast<float>(-zNear));
+    // A box flat across the light's direction (a card facing it) still has the far margin: the
+    // range never collapses.
+    projection = scale.toProjective();
+    if (perspective) {
+        projection(2, 2) = -(near + far) / (far - near);
+        projection(2, 3) = near * far * -2.0f / (far - near);
+        projection(3, 2) = -1.0f;
+        projection(3, 3) = 0.0f;
+    } else {
+        projection(2, 2) = -2.0f / (far - near);
+        projection(2, 3) = -(far + near) / (far - near);
+        projection(3, 2) = 0.0f;
+        projection(3, 3) = 1.0f;
+    }
+    return true;
+}
+
+GeAlignedBox3<float> RsShadowPass::computeSceneBox(const RsScene& scene) {
+    const GeAlignedBox3<float>& bounds = scene._bounds;
+    if (!bounds.isEmpty()) return bounds;
+    GeAlignedBox3<float> box;
+    for (const RCShdPtr<RsGeomInstance>& instance : scene._geomInstances) {
+        const GeAlignedBox3<float> own = instance->getBoundingBox();
+        if (!own.isEmpty()) box.grow(own);
+    }
+    return box;
+}
+
+}  // namespace Zr
