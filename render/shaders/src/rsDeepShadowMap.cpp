@@ -105,6 +105,10 @@ void RsDeepShadowMap::allocateMap() {
 }
 
 void RsDeepShadowMap::setFunction(int index, const Element* elements, int count) {
+    if (count == 0) {
+        _map[index].setFunction(nullptr, 0);
+        return;
+    }
     if (count > _blockCapacity - _blockUsed) {
         // A curve longer than a block gets a block of its own length.
         _blockCapacity = std::max(count, kBlockElements);
