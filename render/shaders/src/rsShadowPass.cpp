@@ -14,9 +14,10 @@ namespace Zr {
 
 namespace {
 
-// The depth of the farthest corner beyond the light, added to the far distance so that the
-// farthest surface stays inside the depth range.
-constexpr double kFarMargin = 0.0001;
+// How far the depth range stands off the scene's box at either end: an absolute part and a part
+// of the distance from the light.
+constexpr double kDepthMargin = 0.0001;
+constexpr double kRelativeDepthMargin = 1e-5;
 // The near distance as a part of the far one, where the scene reaches up to the light.
 constexpr double kNearToFar = 0.0001;
 
@@ -70,10 +71,13 @@ bool RsShadowPass::fitDeepProjection(const GeAffineMatrix3<float>& worldToLight,
     const double zNear = worldToLight.transformPoint(nearCorner).z;
     // A scene wholly at or behind the light's plane has nothing in front of the light: no pass.
     if (!(zFar < 0.0)) return false;
-    const float far = static_cast<float>(-zFar + kFarMargin);
-    const float near = std::max(static_cast<float>(-zFar * kNearToFar), static_cast<float>(-zNear));
-    // A box flat across the light's direction (a card facing it) still has the far margin: the
-    // range never collapses.
+    // Both ends stand off the box by a margin, so that the surfaces that touch them (a card that
+    // faces the light at the box's near side, the ground at its far side) stay inside the range
+    // and its culling; a box flat across the light's direction thus still has a range of twice the
+    // margin. The margin grows with the distance, so that it outlasts the rounding to float.
+    const auto margin = [](double z) { return kDepthMargin + std::fabs(z) * kRelativeDepthMargin; };
+    const float far = static_cast<float>(-zFar + margin(zFar));
+    const float near = std::max(static_cast<float>(-zFar * kNearToFar), static_cast<float>(-zNear - margin(zNear)));
     projection = scale.toProjective();
     if (perspective) {
         projection(2, 2) = -(near + far) / (far - near);
