@@ -3,7 +3,9 @@
 // stand an opaque, glossy sphere, a torus half transparent in the normal mode (drawn by the host's
 // own material, ZrDiffuseMaterial), a cube half transparent in the screen mode (it brightens what
 // lies behind it), and a low sphere drawn as flat yellow wires. An omni light, a spot light and a
-// direct light shine on it; the camera looks down at it slightly from the front.
+// direct light shine on it, each casting shadows from maps of the kind the options choose (depth
+// maps by default); the camera looks down at it slightly from the front. With deep maps the
+// transparent torus and cube cast shadows tinted by their colours.
 //
 // The scene is a scene description, turned into the renderer's scene by RsSceneBuilder as a host
 // does it. The benchmarks that compare the renderer with another one draw the same geometry
@@ -16,12 +18,24 @@
 
 namespace Zr {
 
+// How the sample scene's lights make their shadows.
+struct ZrSampleSceneOptions {
+    enum class Shadows { none, z, midpoint, deep };
+    // No shadows, or the lights' map type: nearest depth, midpoint of the two nearest depths, or
+    // deep maps of transmittance.
+    Shadows shadows = Shadows::z;
+    // Width and height of each light's map (of each cube face for the omni light), in pixels.
+    int mapSize = 1024;
+};
+
 class ZrSampleScene {
 public:
+    using Options = ZrSampleSceneOptions;
+
     // The scene description: geometry instances with their materials, and the three lights.
-    static RCShdPtr<SdScene> makeDescription();
+    static RCShdPtr<SdScene> makeDescription(const Options& options = {});
     // The lit renderer scene of the description, made by RsSceneBuilder.
-    static RCShdPtr<RsScene> makeScene();
+    static RCShdPtr<RsScene> makeScene(const Options& options = {});
     // The description's geometry without lights, each material shaded by a shader of shaderMaker.
     static RCShdPtr<RsScene> makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker =
                                                 ZrSceneKit::diffuseShaderMaker());
