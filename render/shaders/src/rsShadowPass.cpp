@@ -50,9 +50,10 @@ void RsShadowPass::renderDepthMap(SdStdLight::ShadowMapType type, double* map, i
     }
 }
 
-void RsShadowPass::renderDeepMap(RsDeepShadowMap& map, const RCShdPtr<RsScene>& scene) {
+void RsShadowPass::renderDeepMap(RsDeepShadowMap& map, const RCShdPtr<RsScene>& scene, RsFZBufferMemory* memory) {
     RsFZBufferFactory factory;
     factory.setOutput(map);
+    factory.setMemory(memory);
     renderPass(factory, map.getWorldToShadowMapMatrix(), map.getProjectionMatrix(), scene);
 }
 

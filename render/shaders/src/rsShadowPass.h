@@ -16,6 +16,7 @@ namespace Zr {
 
 class RsDeepShadowMap;
 class RsScene;
+struct RsFZBufferMemory;
 
 class RsShadowPass {
 public:
@@ -26,8 +27,10 @@ public:
                                const GeAffineMatrix3<float>& worldToMap, const GeProjectiveMatrix3<float>& projection,
                                const RCShdPtr<RsScene>& scene);
     // Renders the transmittance curves of the scene's casters into map, whose size, matrices and
-    // empty curves are set.
-    static void renderDeepMap(RsDeepShadowMap& map, const RCShdPtr<RsScene>& scene);
+    // empty curves are set. memory, when given, lends the fragment buffer its arrays and pool and
+    // keeps them for the next pass (the faces of a cube share one).
+    static void renderDeepMap(RsDeepShadowMap& map, const RCShdPtr<RsScene>& scene,
+                              RsFZBufferMemory* memory = nullptr);
 
     // The projection of a single deep map whose depth range is fitted to the scene's box along
     // the light: x and y scaled by scale, in perspective or parallel. False, with projection

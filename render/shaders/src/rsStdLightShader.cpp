@@ -5,6 +5,7 @@
 #include "rsCubeDeepShadowMap.h"
 #include "rsCubeShadowMap.h"
 #include "rsDeepShadowMap.h"
+#include "rsFZBuffer.h"
 #include "rsShadingContext.h"
 #include "rsShadowMap.h"
 #include "rsScene.h"
@@ -103,8 +104,11 @@ const RsShadowEvaluator* RsStdLightShader::renderCubeMaps(const RCShdPtr<RsScene
     }
     deepMap.setMapsCenter(center, scene);
     deepMap.setCameraMatrix(_cameraToWorld);
+    // The six passes draw into fragment buffers of one size, one after the other: they share
+    // one buffer's memory.
+    RsFZBufferMemory memory;
     for (int f = 0; f < RsCubeDeepShadowMap::kFaceCount; ++f)
-        RsShadowPass::renderDeepMap(deepMap.getMap(static_cast<RsCubeDeepShadowMap::CubeFace>(f)), scene);
+        RsShadowPass::renderDeepMap(deepMap.getMap(static_cast<RsCubeDeepShadowMap::CubeFace>(f)), scene, &memory);
     return &deepMap;
 }
 
