@@ -20,6 +20,7 @@ namespace {
 using namespace RsTest;
 using Rgb = CoRgbColorTyped<float>;
 using Element = RsTransmittanceFunction::Element;
+using M = GeAffineMatrix3<float>;
 
 // The step function of a curve, as defined: 1 up to and including the first element's depth, then
 // each element's transmittance up to and including the next one's depth.
@@ -45,7 +46,7 @@ TEST(RsDeepShadowMap, RandomStacksGiveTheProductOfTheirLayersCutAtBlackness) {
             l.x1 = l.x0 + 1 + int(rng() % (size - l.x0)), l.y1 = l.y0 + 1 + int(rng() % (size - l.y0));
             const int kind = int(rng() % 8);  // black, one black channel, tiny, or plain
             if (kind == 0) l.colour = Rgb(0.0f);
-            if (kind == 1) l.colour.g = 0.0f;
+            if (kind == 1) l.colour.r = 0.0f;
             if (kind == 2) l.colour = Rgb(1e-7f, 0.5f, 1e-7f);
             layers.push_back(l);
             // Cells of the parallel map are 0.25 wide: the card's edges lie on cell borders.
@@ -165,6 +166,38 @@ TEST(RsDeepShadowMap, QueriesMatchTheCellsCurvesThroughRandomMatrices) {
     for (int c = 0; c < 64; ++c) edge.setFunction(c, &black, 1);
     EXPECT_EQ(edge.computeBestShadow({-0.7f / 4, -0.5f / 4 - 1.0f, 0}), Rgb(1.0f));  // (3.3, -0.5), half width 0.5
     EXPECT_EQ(edge.computeBestShadow({0, 0, 0}), Rgb(0.0f));
+}
+
+// The depth range of a single deep map, fitted along random light views to random boxes in front of
+// the light: every corner of the box lies inside it, the nearest and the farthest only just.
+TEST(RsDeepShadowMap, TheFittedDepthRangeHoldsTheSceneJustInside) {
+    std::mt19937 rng(63);
+    std::uniform_real_distribution<float> unit(-1.0f, 1.0f);
+    for (int trial = 0; trial < 200; ++trial) {
+        const bool perspective = trial % 2;
+        const GePoint3<float> lo(5 * unit(rng), 5 * unit(rng), -20 + 5 * unit(rng));
+        const GePoint3<float> hi(lo.x + 3 + 3 * unit(rng), lo.y + 3 + 3 * unit(rng), trial % 3 ? lo.z + 4 : lo.z);
+        const RCShdPtr<RsScene> scene = makeScene({makeInstance(makeBoxMesh(lo, hi))});
+        const M worldToLight = M::makeRotation({unit(rng), unit(rng), 5.0f}, 0.3f * unit(rng));
+        GeProjectiveMatrix3<float> projection;
+        ASSERT_TRUE(RsShadowPass::fitDeepProjection(worldToLight, GeScale3<float>(0.3f, 0.3f, 1.0f), perspective,
+                                                    *scene, projection));
+        // The range's ends in front of the light, from the projection's depth row.
+        const double a = projection(2, 2), b = projection(2, 3);
+        const double n = perspective ? b / (a - 1) : (b + 1) / a, f = perspective ? b / (a + 1) : (b - 1) / a;
+        double nearest = 1e9, farthest = -1e9;
+        for (int c = 0; c < 8; ++c) {
+            const double d = -GeAffineMatrix3<double>(worldToLight).transformPoint(cornerOf({lo, hi}, c)).z;
+            nearest = std::min(nearest, d), farthest = std::max(farthest, d);
+        }
+        const double slack = 1e-4 + 2e-5 * farthest;  // the margin, and float rounding
+        EXPECT_TRUE(nearest - n > 0 && nearest - n < slack && f - farthest > 0 && f - farthest < slack)
+            << trial << ' ' << nearest - n << ' ' << f - farthest;
+    }
+    GeProjectiveMatrix3<float> projection;
+    EXPECT_FALSE(RsShadowPass::fitDeepProjection({}, {}, true, *makeScene({}), projection));
+    EXPECT_FALSE(RsShadowPass::fitDeepProjection(M::makeTranslation({0, 0, 30}), {}, true,
+                                                 *makeScene({makeInstance(card(1))}), projection));
 }
 
 }  // namespace
