@@ -6,9 +6,9 @@
 #include "rsCubeShadowMap.h"
 #include "rsDeepShadowMap.h"
 #include "rsFZBuffer.h"
+#include "rsScene.h"
 #include "rsShadingContext.h"
 #include "rsShadowMap.h"
-#include "rsScene.h"
 #include "rsShadowPass.h"
 
 namespace Zr {

@@ -5,8 +5,6 @@
 namespace Zr {
 
 namespace {
-constexpr const char* kSourceFile = "render\\suave\\src\\rsFZBufferFactory";
-
 // The fill colour of a new factory: no colour, full coverage.
 constexpr CoRgbaColorTyped<float> kOpaqueBlack(0.0f, 0.0f, 0.0f, 1.0f);
 }  // namespace

@@ -7,7 +7,6 @@
 #include <memory>
 #include <vector>
 
-#include "assertions.h"
 #include "osMemoryArch.h"
 #include "rsDeepShadowMap.h"
 #include "rsFZBuffer.h"
@@ -17,8 +16,6 @@
 namespace Zr {
 
 namespace {
-
-constexpr const char* kSourceFile = "render\\suave\\src\\rsImageCreatorFZ";
 
 using Rgba = RsImageCreatorFZ::Rgba;
 
