@@ -175,8 +175,11 @@ TEST(RsShadowPasses, DegenerateScenesGivePhysicalShadowsWithNoNumberOutOfRange) 
             const RCShdPtr<RsLightShader> light =
                 makeLight(kind, active ? type : Type::ShadowMapZ, lights[int(kind)], 128, 0.05f, active);
             const RCShdPtr<RsGeomInstance> ground = receiver(6, M::makeTranslation({0, 0, -10}), light);
-            // The ground alone is lit all over; a card above it casts its shadow onto the middle.
-            for (const bool withCard : {false, true}) {
+            // A card above the ground casts its shadow onto the middle; then, with the maps made
+            // anew, nothing casts, and the ground alone casts onto itself: lit all over.
+            for (const int pass : {0, 1, 2}) {
+                const bool withCard = pass == 0;
+                ground->_castsShadows = pass != 1;
                 std::vector<RCShdPtr<RsGeomInstance>> cards{ground};
                 if (withCard) cards.push_back(blocker(1, M::makeTranslation({0.3f, 0.2f, -7.0f})));
                 const Shot shot(cards, light, {}, kTopView, 32);

@@ -58,10 +58,11 @@ void RsDeepShadowMap::takeFrom(RsDeepShadowMap& other) {
     // The blocks move with the curves that point into them.
     _map = std::move(other._map);
     _blocks = std::move(other._blocks);
+    _block = other._block;
     _blockUsed = other._blockUsed;
-    _blockCapacity = other._blockCapacity;
     other._blocks.clear();
-    other._blockUsed = other._blockCapacity = 0;
+    other._block = 0;
+    other._blockUsed = 0;
     _cameraToMap = other._cameraToMap;
     _worldToMap = other._worldToMap;
     _worldToShadowMap = other._worldToShadowMap;
@@ -96,12 +97,29 @@ CoRgbColorTyped<float> RsDeepShadowMap::computeBestShadow(const GePoint3<float>&
 void RsDeepShadowMap::dropMap() {
     _map.reset();
     _blocks.clear();
-    _blockUsed = _blockCapacity = 0;
+    _block = 0;
+    _blockUsed = 0;
 }
 
 void RsDeepShadowMap::allocateMap() {
-    dropMap();
-    _map = std::make_unique<RsTransmittanceFunction[]>(static_cast<std::size_t>(_intSize) * _intSize);
+    const std::size_t cells = static_cast<std::size_t>(_intSize) * _intSize;
+    // A map is dropped whenever its size changes, so one that is there has this size.
+    if (_map) std::fill_n(_map.get(), cells, RsTransmittanceFunction());
+    else _map = std::make_unique<RsTransmittanceFunction[]>(cells);
+    _block = 0;
+    _blockUsed = 0;
+}
+
+void RsDeepShadowMap::nextBlock(int count) {
+    const std::size_t next = _blocks.empty() ? 0 : _block + 1;
+    if (next == _blocks.size() || _blocks[next].capacity < count) {
+        // A curve longer than a block gets a block of its own length.
+        const int capacity = std::max(count, kBlockElements);
+        _blocks.insert(_blocks.begin() + static_cast<std::ptrdiff_t>(next),
+                       Block{std::make_unique_for_overwrite<Element[]>(static_cast<std::size_t>(capacity)), capacity});
+    }
+    _block = next;
+    _blockUsed = 0;
 }
 
 void RsDeepShadowMap::setFunction(int index, const Element* elements, int count) {
@@ -109,13 +127,8 @@ void RsDeepShadowMap::setFunction(int index, const Element* elements, int count)
         _map[index].setFunction(nullptr, 0);
         return;
     }
-    if (count > _blockCapacity - _blockUsed) {
-        // A curve longer than a block gets a block of its own length.
-        _blockCapacity = std::max(count, kBlockElements);
-        _blocks.push_back(std::make_unique_for_overwrite<Element[]>(static_cast<std::size_t>(_blockCapacity)));
-        _blockUsed = 0;
-    }
-    Element* const stored = _blocks.back().get() + _blockUsed;
+    if (_blocks.empty() || count > _blocks[_block].capacity - _blockUsed) nextBlock(count);
+    Element* const stored = _blocks[_block].elements.get() + _blockUsed;
     std::copy_n(elements, count, stored);
     _blockUsed += count;
     _map[index].setFunction(stored, count);

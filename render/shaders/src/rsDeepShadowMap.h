@@ -47,7 +47,8 @@ public:
     // The transmittance of the one cell under the point; lit off the map.
     CoRgbColorTyped<float> computeFastShadow(const GePoint3<float>& point) const override;
 
-    // Replaces the curves by size x size empty ones (everything lit).
+    // Makes the curves size x size empty ones (everything lit); the memory of a former map of the
+    // same size is used again.
     void allocateMap();
     // The curves, row-major; null before allocateMap.
     RsTransmittanceFunction* getMap() { return _map.get(); }
@@ -74,6 +75,8 @@ public:
 private:
     void takeFrom(RsDeepShadowMap& other);
     void dropMap();
+    // Makes _block a block with room for count elements after the current one.
+    void nextBlock(int count);
 
     std::unique_ptr<RsTransmittanceFunction[]> _map;
     GeProjectiveMatrix3<float> _cameraToMap;
@@ -87,11 +90,16 @@ private:
     float _biasZ = 0.0f;
     float _biasW = 0.0f;
     float _halfRange = 0.0f;
-    // The elements of all curves, in blocks that never move; the last block fills up to
-    // _blockUsed.
-    std::vector<std::unique_ptr<Element[]>> _blocks;
+    // The elements of all curves, in blocks that never move. Blocks before _block are full,
+    // _block is filled up to _blockUsed, and later ones are kept from a former rendering of a map
+    // of this size, for the next one to fill again.
+    struct Block {
+        std::unique_ptr<Element[]> elements;
+        int capacity;
+    };
+    std::vector<Block> _blocks;
+    std::size_t _block = 0;
     int _blockUsed = 0;
-    int _blockCapacity = 0;
 };
 
 }  // namespace Zr
