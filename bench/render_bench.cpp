@@ -4,6 +4,8 @@
 // the quad's, over 100,352, is the cost of one triangle), and ten transparent layers over the
 // whole picture. Each reports megapixels and fragments (shaded surface samples) per second, and
 // the process's peak resident memory so far (run one benchmark per process to read it per scene).
+// The lit sample scene with each kind of shadow map at two map sizes is timed twice: its lights'
+// shadow passes alone, and whole render calls, whose time less the passes' is the camera pass.
 #include <benchmark/benchmark.h>
 
 #include <sys/resource.h>
@@ -100,6 +102,55 @@ void BM_LitSampleScene(benchmark::State& state) {
                            benchmark::Counter::OneK::kIs1000);
 }
 BENCHMARK(BM_LitSampleScene)->Args({1920, 1080})->Unit(benchmark::kMillisecond);
+
+// The sample scene's lights with the map type of the first argument (0 none, 1 depth, 2 midpoint,
+// 3 deep) at the map size of the second.
+RCShdPtr<RsScene> shadowedScene(const benchmark::State& state) {
+    ZrSampleScene::Options options;
+    options.shadows = static_cast<ZrSampleScene::Options::Shadows>(state.range(0));
+    options.mapSize = static_cast<int>(state.range(1));
+    return ZrSampleScene::makeScene(options);
+}
+
+void shadowArgs(benchmark::internal::Benchmark* b, bool withNone) {
+    b->ArgNames({"maps", "size"});
+    for (int type = withNone ? 0 : 1; type <= 3; ++type)
+        for (int size : {1024, 2048}) b->Args({type, size});
+    b->Unit(benchmark::kMillisecond);
+}
+
+// The shadow passes of the three lights (one spot, one direct, six for the omni light), as a
+// render call makes them before its camera pass: each light placed for the camera of a
+// 1920 x 1080 picture, then its maps rendered.
+void BM_ShadowPasses(benchmark::State& state) {
+    const RCShdPtr<RsScene> scene = shadowedScene(state);
+    const GeAffineMatrix3<float> worldToCamera = ZrSampleScene::makeCamera(1920, 1080)->getMatrix().computeInverse();
+    for (auto _ : state) {
+        for (const RCShdPtr<RsLightShader>& light : scene->_lights) {
+            light->setupRender(worldToCamera);
+            light->initializeMaps(scene);
+        }
+    }
+    state.counters["mapPixels/s"] = benchmark::Counter(8.0 * static_cast<double>(state.range(1) * state.range(1)),
+                                                       benchmark::Counter::kIsIterationInvariantRate);
+}
+BENCHMARK(BM_ShadowPasses)->Apply([](benchmark::internal::Benchmark* b) { shadowArgs(b, false); });
+
+// Whole render calls of the sample scene at 1920 x 1080 with those maps: the passes above, then
+// the camera pass, whose every lit fragment asks each light's map.
+void BM_ShadowedSampleScene(benchmark::State& state) {
+    const RCShdPtr<RsScene> scene = shadowedScene(state);
+    const GeRectangle<int> rectangle{0, 1920, 0, 1080};
+    IxTile tile(IxPixelFormat(IxPixelFormat::RGBA, IxPixelFormat::UINT8), rectangle, {0.0f, 0.0f, 0.0f, 0.0f});
+    const IxWriteGuard output(tile);
+    const RCShdPtr<SdInstance> camera = ZrSampleScene::makeCamera(1920, 1080);
+    RCShdPtr<RsRenderer> renderer = makeShared<RsRenderer>();
+    for (auto _ : state) renderer->render(camera, scene, rectangle, output);
+    rusage usage{};
+    getrusage(RUSAGE_SELF, &usage);
+    state.counters["peakMiB"] = static_cast<double>(usage.ru_maxrss) / 1024.0;
+}
+BENCHMARK(BM_ShadowedSampleScene)->Apply([](benchmark::internal::Benchmark* b) { shadowArgs(b, true); });
 
 double aspectOf(const benchmark::State& state) {
     return static_cast<double>(state.range(0)) / static_cast<double>(state.range(1));

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cmath>
 #include <random>
+#include <tuple>
 #include <vector>
 
 #include "geAlignedBox3.h"
@@ -17,20 +18,6 @@ namespace Zr {
 namespace {
 
 using Rgb = CoRgbColorTyped<float>;
-
-// The lit part of the square of half width r around (u, v) by n x n samples, counting those inside
-// the map: a product grid, so a cell's samples are the product of its column's and its row's counts.
-double supersampledLight(const std::vector<double>& cells, int size, double u, double v, double r, double z) {
-    std::vector<double> columns(size, 0.0), rows(size, 0.0);
-    for (int k = 0, n = 20000; k < n; ++k) {
-        const double t = (k + 0.5) / n * 2.0 * r - r;
-        if (u + t >= 0.0 && u + t < size) columns[static_cast<int>(std::floor(u + t))] += 1.0;
-        if (v + t >= 0.0 && v + t < size) rows[static_cast<int>(std::floor(v + t))] += 1.0;
-    }
-    double lit = 0.0, shaded = 0.0;
-    for (int c = 0; c < size * size; ++c) (z > cells[c] ? lit : shaded) += columns[c % size] * rows[c / size];
-    return lit + shaded == 0.0 ? 1.0 : lit / (lit + shaded);
-}
 
 // Random views, cameras, biases, depths and projections with any depth row (the map keeps view depth),
 // worked forward in double: the single sample tests the cell under the point (lit off the map), the
@@ -78,7 +65,8 @@ TEST(RsShadowMapTest, QueriesMatchBruteForceThroughRandomMatrices) {
             if (n >= 20) map.setRange(static_cast<float>(2 * r));
             if (r == 0 && !exact) continue;
             // The sampling errs by 1e-4 per cell border; the square's far end stops 0.001 short.
-            ASSERT_NEAR(map.computeBestShadow(p).r, supersampledLight(cells, size, u, v, r, z), 2e-3) << u << ' ' << v;
+            const auto lit = [&](int c) { return z > cells[c] ? 1.0 : 0.0; };
+            ASSERT_NEAR(map.computeBestShadow(p).r, RsTest::supersampledMean(size, u, v, r, 1.0, lit), 2e-3) << u;
         }
     }
 }
@@ -106,6 +94,23 @@ TEST(RsShadowMapTest, SetSizeKeepsTheMapOnlyForTheSameSize) {
     };
     EXPECT_TRUE(answer(0.95f, 0.95f, 0.5f) == 0.0f && answer(0.7f, 0.95f, 0.5f) == 1.0f);  // u = 8.775, 7.65
     for (float t = -0.9f; t < 1.0f; t += 0.2f) EXPECT_TRUE(answer(1, t) == 1.0f && answer(t, 1) == 1.0f) << t;
+}
+
+// Squares that meet the map in no area (along its top edge, from outside) are point samples, lit off
+// the map rather than 0 / 0; a size that is not whole answers from its whole cells only, lit in the
+// part cell beyond them. Identity matrices: u = 4.25 x + 4.25 for size 8.5.
+TEST(RsShadowMapTest, ZeroAreaSquaresAndPartCellsAreOffTheMap) {
+    RsShadowMap map;
+    map.setSize(8.5f);
+    std::fill_n(map.getMap(), 64, 1e30);  // everything in the cells is shadowed
+    // x, y, filter width, lit: u = 3.3, v = -0.5 with half width 0.5 touches row 0 along a line;
+    // u = 8.075 lies in the part cell, u = 7.8625 in the last whole one.
+    for (const auto& [x, y, range, lit] : {std::tuple{-0.7f / 4.25f, -4.75f / 4.25f, 1.0f, 1.0f}, {0.9f, 0.0f, 0.0f, 1.0f},
+                                            {0.0f, 0.9f, 0.0f, 1.0f}, {0.85f, 0.0f, 0.0f, 0.0f}, {0.0f, 0.85f, 0.0f, 0.0f}}) {
+        map.setRange(range);
+        EXPECT_EQ(map.computeBestShadow({x, y, 0}), Rgb(lit)) << x << ' ' << y;
+        EXPECT_EQ(map.computeFastShadow({x, y, 0}), Rgb(lit)) << x << ' ' << y;
+    }
 }
 
 // A cube map around (1, 2, 3), assigned from the one set up, whose face f holds the depth -distance[f]:

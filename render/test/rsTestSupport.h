@@ -21,6 +21,7 @@
 #include "pxRequestMgr.h"
 #include "rsRasterizer.h"
 #include "rsRenderer.h"
+#include "rsShadowShader.h"
 #include "sdMeshBuilder.h"
 #include "sdTextureParams.h"
 #include "sdTextureSampler.h"
@@ -280,6 +281,64 @@ inline void expectNearRgba(const Rgba& got, const Rgba& want, double tolerance, 
     EXPECT_NEAR(got.g, want.g, tolerance) << where;
     EXPECT_NEAR(got.b, want.b, tolerance) << where;
     EXPECT_NEAR(got.a, want.a, tolerance) << where;
+}
+
+// ---- Shadows -------------------------------------------------------------------------------------
+
+// The mean of cell(index) (row * size + column) over the square of half width r around (u, v) by
+// n x n samples, counting those inside the map: a product grid, so a cell's samples are the product
+// of its column's and its row's counts. `outside` where no sample falls inside.
+template <class Cell>
+double supersampledMean(int size, double u, double v, double r, double outside, Cell&& cell) {
+    std::vector<double> columns(size, 0.0), rows(size, 0.0);
+    for (int k = 0, n = 20000; k < n; ++k) {
+        const double t = (k + 0.5) / n * 2.0 * r - r;
+        if (u + t >= 0.0 && u + t < size) columns[static_cast<int>(std::floor(u + t))] += 1.0;
+        if (v + t >= 0.0 && v + t < size) rows[static_cast<int>(std::floor(v + t))] += 1.0;
+    }
+    double sum = 0.0, weight = 0.0;
+    for (int c = 0; c < size * size; ++c) {
+        const double w = columns[c % size] * rows[c / size];
+        sum += w * cell(c), weight += w;
+    }
+    return weight == 0.0 ? outside : sum / weight;
+}
+
+// A square card of half side h around the origin in the plane z = 0, facing +z.
+inline RCShdPtr<const SdMesh> card(float h) { return makeMesh({{-h, -h, 0}, {h, -h, 0}, {h, h, 0}, {-h, h, 0}}, {0, 1, 2, 0, 2, 3}); }
+
+// The shadow shader of a material of the given diffuse colour and opacity a, which lets through
+// (colour x a + 1 - a) x (1 - a) per channel.
+inline RCShdPtr<RsMaterialShader> shadowShaderOf(const CoRgbColorTyped<float>& colour, float opacity) {
+    RCShdPtr<SdMaterial> m = makeShared<SdMaterial>();
+    m->_diffuse = colour;
+    m->_opacity = opacity;
+    return makeShared<RsShadowShader>(m);
+}
+
+// An instance with a shader for the camera and a shadow shader for the lights' deep passes.
+inline RCShdPtr<RsGeomInstance> caster(const RCShdPtr<const SdMesh>& mesh, const GeAffineMatrix3<float>& matrix,
+                                       const RCShdPtr<RsMaterialShader>& material,
+                                       const RCShdPtr<RsMaterialShader>& shadowShader, bool visible = true) {
+    return makeShared<RsGeomInstance>(matrix, mesh, RsGeomInstance::MaterialList{material},
+                                      RsGeomInstance::MaterialList{shadowShader}, makeAttributes(0, visible),
+                                      std::vector<unsigned int>{});
+}
+
+// A material whose colour is the product of what the lights let through at the fragment
+// (RsLightShader::shadow), alpha 1.
+inline RCShdPtr<RsMaterialShader> shadowProbe(std::vector<RCShdPtr<RsLightShader>> lights) {
+    MaterialSettings s;
+    s.needed = 0x01u;
+    s.probe = [lights](const RsShadingContext& context) {
+        Rgba c(1.0f, 1.0f, 1.0f, 1.0f);
+        for (const auto& light : lights) {
+            const CoRgbColorTyped<float> passed = light->shadow(context);
+            c.r *= passed.r, c.g *= passed.g, c.b *= passed.b;
+        }
+        return c;
+    };
+    return makeShared<TestMaterial>(s);
 }
 
 // ---- Texture doubles -----------------------------------------------------------------------------

@@ -327,7 +327,7 @@ std::vector<std::string> ZrModelFile::cameraNames() const {
     return names;
 }
 
-RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds) const {
+RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds, const ZrShadowOptions& shadows) const {
     const Model& model = *_model;
     const aiScene& source = *model.scene;
     const std::map<const aiNode*, aiMatrix4x4> world = model.worldAt(seconds);
@@ -347,6 +347,14 @@ RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds) const {
         }
     }
 
+    // A direct light's map reaches this far to either side of its axis: the model's bounding
+    // sphere, with a little to spare.
+    const Bounds bounds = model.boundsAt(world);
+    const double shadowReach = bounds.isEmpty() ? 1.0 : std::max(1e-6, 0.55 * (bounds.hi - bounds.lo).length());
+    // Models come in any unit: the depth bias that keeps a surface from shadowing itself scales
+    // with the model.
+    const double shadowBias = 1e-2 * shadowReach;
+
     unsigned int lightNumber = 0;
     for (unsigned int l = 0; l < source.mNumLights; ++l) {
         const aiLight& light = *source.mLights[l];
@@ -363,6 +371,9 @@ RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds) const {
         ours->_color = {c.r / intensity, c.g / intensity, c.b / intensity};
         ours->_intensity = intensity;
         ours->_emitAmbient = false;
+        shadows.applyTo(*ours);
+        ours->_width = static_cast<float>(shadowReach);
+        ours->_shadowBias = static_cast<float>(shadowBias);
         if (light.mType == aiLightSource_SPOT) {
             const float outer = std::clamp(light.mAngleOuterCone, 1e-3f, 3.1f);
             ours->_outerConeAngle = outer;
@@ -395,7 +406,6 @@ RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds) const {
         // A key light from the upper left front, a weaker fill from the right and a rim light from
         // behind, all direct so that they light the model alike at any size; the fill also gives
         // the ambient light that keeps the sides turned away from both from going black.
-        const Bounds bounds = model.boundsAt(world);
         const GePoint3<double> centre{(bounds.lo.x + bounds.hi.x) / 2, (bounds.lo.y + bounds.hi.y) / 2,
                                       (bounds.lo.z + bounds.hi.z) / 2};
         struct Rig { double x, y, z; float intensity; bool ambient; };
@@ -405,6 +415,9 @@ RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds) const {
             light->_kind = SdStdLight::Kind::direct;
             light->_intensity = rig.intensity;
             light->_emitAmbient = rig.ambient;
+            shadows.applyTo(*light);
+            light->_width = static_cast<float>(shadowReach);
+            light->_shadowBias = static_cast<float>(shadowBias);
             const GePoint3<double> from{centre.x + rig.x, centre.y + rig.y, centre.z + rig.z};
             RCShdPtr<SdInstance> instance = makeShared<SdInstance>(light, ZrSceneKit::makeLookAt(from, centre));
             instance->setLightNumber(++lightNumber);

@@ -17,6 +17,7 @@
 #include "rcShdPtr.h"
 #include "sdInstance.h"
 #include "sdScene.h"
+#include "zrShadowOptions.h"
 
 namespace Zr {
 
@@ -36,8 +37,9 @@ public:
     ZrModelFile(const ZrModelFile&) = delete;
     ZrModelFile& operator=(const ZrModelFile&) = delete;
 
-    // The scene at the given time of the file's animation (its first; none: the rest pose).
-    RCShdPtr<SdScene> sceneAt(double seconds) const;
+    // The scene at the given time of the file's animation (its first; none: the rest pose), its
+    // lights casting shadows as asked. Direct lights' maps cover the model's bounds.
+    RCShdPtr<SdScene> sceneAt(double seconds, const ZrShadowOptions& shadows = {}) const;
     // The names of the file's cameras, in the file's order.
     std::vector<std::string> cameraNames() const;
     // The named camera at the given time for pictures of the given aspect; an empty name takes

@@ -68,7 +68,7 @@ RCShdPtr<SdInstance> lightAt(const RCShdPtr<SdStdLight>& light, unsigned int num
 
 }  // namespace
 
-RCShdPtr<SdScene> ZrSampleScene::makeDescription() {
+RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options) {
     ZrDiffuseMaterial::registerShaderBuilder();
     RCShdPtr<SdScene> scene = makeShared<SdScene>();
 
@@ -93,9 +93,10 @@ RCShdPtr<SdScene> ZrSampleScene::makeDescription() {
     scene->addGeometry(placed(ZrShapes::makeTorus(0.85f, 0.3f, 40, 16), {torus},
                               ZrSceneKit::makePlacement({1.7, 1.15, 0.2}, {1.0, -0.35, 0.0}, 80.0)));
 
-    // A blue cube in front, turned about the vertical, laid over the scene in the screen mode.
+    // A blue cube in front, turned about the vertical, half clear and laid over the scene in the
+    // screen mode; its shadow in deep maps is blue.
     scene->addGeometry(placed(ZrShapes::makeCube(0.6f),
-                              {standard({0.25f, 0.45f, 0.95f}, {0.5f, 0.5f, 0.5f}, 0.4f, 0.7f, Mode::screen)},
+                              {standard({0.25f, 0.45f, 0.95f}, {0.5f, 0.5f, 0.5f}, 0.4f, 0.5f, Mode::screen)},
                               ZrSceneKit::makePlacement({0.1, 0.6, 2.0}, {0, 1, 0}, 30.0)));
 
     // A coarse yellow sphere at the back, drawn as flat wires one and a half pixels wide.
@@ -111,20 +112,23 @@ RCShdPtr<SdScene> ZrSampleScene::makeDescription() {
     RCShdPtr<SdStdLight> omni = light(SdStdLight::Kind::omni, {1.0f, 0.92f, 0.8f}, 0.55f);
     omni->_decayType = SdStdLight::DecayType::quadratic;
     omni->_decayParameter = 12.0f;
+    options.applyTo(*omni);
     scene->addLight(lightAt(omni, 1, {-4.0, 5.0, 3.0}, {0.0, 0.0, 0.0}));
     RCShdPtr<SdStdLight> spot = light(SdStdLight::Kind::spot, {1.0f, 1.0f, 1.0f}, 0.7f);
     spot->_innerConeAngle = 0.45f;
     spot->_outerConeAngle = 0.75f;
+    options.applyTo(*spot);
     scene->addLight(lightAt(spot, 2, {4.5, 6.0, 5.0}, {0.0, 0.6, 0.0}));
     RCShdPtr<SdStdLight> direct = light(SdStdLight::Kind::direct, {0.75f, 0.85f, 1.0f}, 0.3f);
     direct->_emitAmbient = true;
+    options.applyTo(*direct);
     scene->addLight(lightAt(direct, 3, {1.0, 8.0, 2.0}, {0.0, 0.0, 0.0}));
     return scene;
 }
 
-RCShdPtr<RsScene> ZrSampleScene::makeScene() {
+RCShdPtr<RsScene> ZrSampleScene::makeScene(const Options& options) {
     RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
-    builder->addScene(makeDescription());
+    builder->addScene(makeDescription(options));
     return builder->createRendererScene();
 }
 

@@ -3,7 +3,9 @@
 // stand an opaque, glossy sphere, a torus half transparent in the normal mode (drawn by the host's
 // own material, ZrDiffuseMaterial), a cube half transparent in the screen mode (it brightens what
 // lies behind it), and a low sphere drawn as flat yellow wires. An omni light, a spot light and a
-// direct light shine on it; the camera looks down at it slightly from the front.
+// direct light shine on it, each casting shadows from maps of the kind the options choose (depth
+// maps by default); the camera looks down at it slightly from the front. With deep maps the
+// transparent torus and cube cast shadows tinted by their colours.
 //
 // The scene is a scene description, turned into the renderer's scene by RsSceneBuilder as a host
 // does it. The benchmarks that compare the renderer with another one draw the same geometry
@@ -13,15 +15,18 @@
 #include "sdInstance.h"
 #include "sdScene.h"
 #include "zrSceneKit.h"
+#include "zrShadowOptions.h"
 
 namespace Zr {
 
 class ZrSampleScene {
 public:
+    using Options = ZrShadowOptions;
+
     // The scene description: geometry instances with their materials, and the three lights.
-    static RCShdPtr<SdScene> makeDescription();
+    static RCShdPtr<SdScene> makeDescription(const Options& options = {});
     // The lit renderer scene of the description, made by RsSceneBuilder.
-    static RCShdPtr<RsScene> makeScene();
+    static RCShdPtr<RsScene> makeScene(const Options& options = {});
     // The description's geometry without lights, each material shaded by a shader of shaderMaker.
     static RCShdPtr<RsScene> makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker =
                                                 ZrSceneKit::diffuseShaderMaker());

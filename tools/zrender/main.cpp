@@ -64,7 +64,8 @@ int run(const ZrOptions& options) {
     int status = 0;
     for (int frame = options.firstFrame; frame <= options.lastFrame; ++frame) {
         const double seconds = options.framesGiven ? frame / options.framesPerSecond : 0.0;
-        const RCShdPtr<SdScene> description = model ? model->sceneAt(seconds) : ZrSampleScene::makeDescription();
+        const RCShdPtr<SdScene> description = model ? model->sceneAt(seconds, options.shadows)
+                                                         : ZrSampleScene::makeDescription(options.shadows);
         const RCShdPtr<SdInstance> camera = model ? model->cameraAt(options.camera, seconds, aspect)
                                                   : ZrSampleScene::makeCamera(options.width, options.height, seconds);
         const auto makeScene = [&description] {

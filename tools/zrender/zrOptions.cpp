@@ -2,6 +2,7 @@
 
 #include <charconv>
 #include <iostream>
+#include <map>
 #include <thread>
 #include <vector>
 
@@ -105,6 +106,19 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
                                                "accepts (default 0: exact)")
         ->type_name("T")
         ->check(CLI::Range(0.0f, 1.0f));
+    const std::map<std::string, ZrShadowOptions::Shadows> shadowKinds{
+        {"z", ZrShadowOptions::Shadows::z},
+        {"midpoint", ZrShadowOptions::Shadows::midpoint},
+        {"deep", ZrShadowOptions::Shadows::deep},
+        {"off", ZrShadowOptions::Shadows::none}};
+    app.add_option("--shadows", o.shadows.shadows,
+                   "the lights' shadow maps: z (nearest depth, the default), midpoint (of the two nearest "
+                   "depths), deep (coloured, semi-transparent shadows) or off")
+        ->type_name("z|midpoint|deep|off")
+        ->transform(CLI::CheckedTransformer(shadowKinds, CLI::ignore_case));
+    app.add_option("--shadow-map-size", o.shadows.mapSize, "side of each shadow map in texels (default 1024)")
+        ->type_name("N")
+        ->check(CLI::Range(16, 16384));
     app.add_flag("--info", o.info, "print the library's package records and build record, and exit");
 
     try {

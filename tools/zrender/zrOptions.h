@@ -3,6 +3,7 @@
 #include <string>
 
 #include "coRgbaColorTyped.h"
+#include "zrShadowOptions.h"
 
 namespace Zr {
 
@@ -28,6 +29,7 @@ struct ZrOptions {
     // Straight colour of the pixels that no surface covers: a dark blue-grey, opaque.
     CoRgbaColorTyped<float> fill{0.16f, 0.18f, 0.23f, 1.0f};
     bool info = false;
+    ZrShadowOptions shadows;
 
     // Reads the arguments. Returns -1 when zrender is to go on, otherwise the exit status: 0 after
     // printing the help, 2 after printing a usage error of one line on standard error.

@@ -9,7 +9,12 @@ RsDirectLightShader::RsDirectLightShader(unsigned int lightId, const GeAffineMat
     : RsStdLightShader(lightId, lightToWorld, light),
       _scale(1.0f / light->_width, 1.0f / light->_width, 1.0f) {
     // The map spans twice the width across.
-    setUpShadowMap(_shadowMap, _scale, MapView::parallel);
+    setUpShadowMap(_shadowMap, _deepShadowMap, _scale, MapView::parallel);
+}
+
+const RsShadowEvaluator* RsDirectLightShader::renderShadowMaps(const RCShdPtr<RsScene>& scene,
+                                                               SdStdLight::ShadowMapType type) {
+    return renderSingleMap(scene, type, _shadowMap, _deepShadowMap, _scale, MapView::parallel);
 }
 
 RsDirectLightShader::~RsDirectLightShader() = default;
@@ -32,6 +37,8 @@ void RsDirectLightShader::dump(std::ostream& os) const {
     RsStdLightShader::dump(os);
     os << " _shadowMap:";
     _shadowMap.dump(os);
+    os << " _deepShadowMap:";
+    _deepShadowMap.dump(os);
     os << " _scale:";
     _scale.dump(os);
     os << " _direction:";

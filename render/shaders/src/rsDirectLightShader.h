@@ -30,6 +30,9 @@ public:
     void dump(std::ostream& os) const;
 
 protected:
+    // One map along the light's parallel beam.
+    const RsShadowEvaluator* renderShadowMaps(const RCShdPtr<RsScene>& scene, SdStdLight::ShadowMapType type) override;
+
     // From the light's space to the map's projection: 1 / width across, 1 along the light.
     GeScale3<float> _scale;
     // The unit direction in which the light shines, in camera space.

@@ -7,7 +7,12 @@ namespace Zr {
 RsOmniLightShader::RsOmniLightShader(unsigned int lightId, const GeAffineMatrix3<float>& lightToWorld,
                                      const RCShdPtr<const SdStdLight>& light)
     : RsStdLightShader(lightId, lightToWorld, light) {
-    setUpShadowMap(_shadowMap);
+    setUpShadowMap(_shadowMap, _deepShadowMap);
+}
+
+const RsShadowEvaluator* RsOmniLightShader::renderShadowMaps(const RCShdPtr<RsScene>& scene,
+                                                             SdStdLight::ShadowMapType type) {
+    return renderCubeMaps(scene, type, _shadowMap, _deepShadowMap);
 }
 
 RsOmniLightShader::~RsOmniLightShader() = default;
@@ -26,6 +31,8 @@ void RsOmniLightShader::dump(std::ostream& os) const {
     RsStdLightShader::dump(os);
     os << " _shadowMap:";
     _shadowMap.dump(os);
+    os << " _deepShadowMap:";
+    _deepShadowMap.dump(os);
 }
 
 }  // namespace Zr

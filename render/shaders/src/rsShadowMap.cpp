@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <utility>
 
+#include "rsAreaFilter.h"
 #include "rsTolerance.h"
 
 namespace Zr {
@@ -31,10 +32,6 @@ inline MapPosition toMap(const GeProjectiveMatrix3<float>& matrix, float halfSiz
     q.v = (m[1] * p.x + m[5] * p.y + m[9] * p.z + m[13]) * k + halfSize;
     return q;
 }
-
-// The right and bottom ends of the filter square stop this far short of the map's edge, so that
-// their truncation is the last cell.
-constexpr float kEdgeInset = 0.001f;
 
 }  // namespace
 
@@ -69,9 +66,10 @@ void RsShadowMap::takeFrom(RsShadowMap& other) {
 CoRgbColorTyped<float> RsShadowMap::computeFastShadow(const GePoint3<float>& point) const {
     if (!_map) return kLit;
     const MapPosition q = toMap(_cameraToMap, _halfSize, _bias, point);
-    // Outside the map nothing casts a shadow. Written as the negation of "inside" so that a
-    // coordinate that is not a number also counts as outside.
-    if (!(q.u >= 0.0f && q.u < _size && q.v >= 0.0f && q.v < _size)) return kLit;
+    // Outside the map's cells nothing casts a shadow. Written as the negation of "inside" so that
+    // a coordinate that is not a number also counts as outside.
+    const float extent = static_cast<float>(_intSize);
+    if (!(q.u >= 0.0f && q.u < extent && q.v >= 0.0f && q.v < extent)) return kLit;
     const int i = static_cast<int>(q.u);
     const int j = static_cast<int>(q.v);
     return static_cast<double>(q.z) > _map[j * _intSize + i] ? kLit : kShadowed;
@@ -80,63 +78,11 @@ CoRgbColorTyped<float> RsShadowMap::computeFastShadow(const GePoint3<float>& poi
 CoRgbColorTyped<float> RsShadowMap::computeBestShadow(const GePoint3<float>& point) const {
     if (!_map) return kLit;
     const MapPosition q = toMap(_cameraToMap, _halfSize, _bias, point);
-
-    // The filter square, cut to the map.
-    const float left = std::max(0.0f, q.u - _halfRange);
-    const float top = std::max(0.0f, q.v - _halfRange);
-    float right = q.u + _halfRange;
-    if (right >= _size) right = _size - kEdgeInset;
-    float bottom = q.v + _halfRange;
-    if (bottom >= _size) bottom = _size - kEdgeInset;
-    // Wholly outside the map (or not a number): lit.
-    if (!(left <= right && top <= bottom)) return kLit;
-
-    const int i0 = static_cast<int>(left);
-    const int i1 = static_cast<int>(right);
-    const int j0 = static_cast<int>(top);
-    const int j1 = static_cast<int>(bottom);
+    // The comparison is made with the same depth in every cell; a lit cell counts 1.
     const double z = q.z;
-    const double* cell = _map.get() + j0 * _intSize + i0;
-    if (i0 == i1 && j0 == j1) return z > *cell ? kLit : kShadowed;
-
-    // The part of the first and last column and row that the square covers.
-    const float fl = 1.0f - left + static_cast<float>(i0);
-    const float fr = right - static_cast<float>(i1);
-    const float ft = 1.0f - top + static_cast<float>(j0);
-    const float fb = bottom - static_cast<float>(j1);
-
-    // Lit cells add their weight; the walk goes row by row in address order.
-    float sum = 0.0f;
-    if (i0 == i1) {
-        const float wx = fl - 1.0f + fr;
-        sum += z > *cell ? ft * wx : 0.0f;
-        for (int j = j0 + 1; j < j1; ++j) {
-            cell += _intSize;
-            sum += z > *cell ? wx : 0.0f;
-        }
-        cell += _intSize;
-        sum += z > *cell ? fb * wx : 0.0f;
-    } else if (j0 == j1) {
-        const float wy = ft - 1.0f + fb;
-        sum += z > cell[0] ? fl * wy : 0.0f;
-        for (int i = 1; i < i1 - i0; ++i) sum += z > cell[i] ? wy : 0.0f;
-        sum += z > cell[i1 - i0] ? fr * wy : 0.0f;
-    } else {
-        const int last = i1 - i0;
-        const auto addRow = [&](const double* row, float first, float middle, float end) {
-            sum += z > row[0] ? first : 0.0f;
-            for (int i = 1; i < last; ++i) sum += z > row[i] ? middle : 0.0f;
-            sum += z > row[last] ? end : 0.0f;
-        };
-        addRow(cell, fl * ft, ft, fr * ft);
-        for (int j = j0 + 1; j < j1; ++j) {
-            cell += _intSize;
-            addRow(cell, fl, 1.0f, fr);
-        }
-        cell += _intSize;
-        addRow(cell, fl * fb, fb, fr * fb);
-    }
-    const float lit = sum / ((right - left) * (bottom - top));
+    const double* cells = _map.get();
+    const float lit = rsAreaFilter(q.u, q.v, _halfRange, _intSize, 1.0f,
+                                   [z, cells](int index) { return z > cells[index] ? 1.0f : 0.0f; });
     return {lit, lit, lit};
 }
 

@@ -13,8 +13,9 @@
 //
 // computeFastShadow tests the one cell under the point. computeBestShadow is a percentage-closer
 // filter over a square of side twice the half range, each cell counting with the area it shares
-// with the square; the part of the square outside the map neither lights nor shades. Sizes are
-// whole numbers of cells. A map that was never asked for (null) lights everything.
+// with the square; the part of the square outside the map neither lights nor shades
+// (rsAreaFilter.h). A size that is not whole has its whole cells only: the fraction of a cell
+// beyond them counts as off the map. A map that was never asked for (null) lights everything.
 //
 // Copying moves: construction from, and assignment of, a non-const map take its cells over and
 // leave it with none, while all other members are copied.

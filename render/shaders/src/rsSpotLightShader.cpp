@@ -41,7 +41,12 @@ RsSpotLightShader::RsSpotLightShader(unsigned int lightId, const GeAffineMatrix3
     _penumbraScale = _penumbraStart < 1.0f ? 1.0f / (1.0f - _penumbraStart) : 0.0f;
 
     // The map sees the cone's frame in perspective.
-    setUpShadowMap(_shadowMap, _coneScale, MapView::perspective);
+    setUpShadowMap(_shadowMap, _deepShadowMap, _coneScale, MapView::perspective);
+}
+
+const RsShadowEvaluator* RsSpotLightShader::renderShadowMaps(const RCShdPtr<RsScene>& scene,
+                                                             SdStdLight::ShadowMapType type) {
+    return renderSingleMap(scene, type, _shadowMap, _deepShadowMap, _coneScale, MapView::perspective);
 }
 
 RsSpotLightShader::~RsSpotLightShader() = default;
@@ -131,6 +136,8 @@ void RsSpotLightShader::dump(std::ostream& os) const {
     RsStdLightShader::dump(os);
     os << " _shadowMap:";
     _shadowMap.dump(os);
+    os << " _deepShadowMap:";
+    _deepShadowMap.dump(os);
     os << " _projectedMap: " << static_cast<const void*>(_projectedMap.get());
     os << " _projectedSampler: " << static_cast<const void*>(_projectedSampler.get());
     os << " _cameraToCone:";

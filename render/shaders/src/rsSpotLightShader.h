@@ -39,6 +39,9 @@ public:
     void dump(std::ostream& os) const;
 
 protected:
+    // One map seen through the cone, in perspective.
+    const RsShadowEvaluator* renderShadowMaps(const RCShdPtr<RsScene>& scene, SdStdLight::ShadowMapType type) override;
+
     // Multiplies strength by the cone's penumbra at p, a point of the cone's frame in front of
     // the light; false, with strength unchanged, outside the cone. A point on the cone's surface
     // is inside, with no light left.

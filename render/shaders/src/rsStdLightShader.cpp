@@ -2,9 +2,14 @@
 
 #include "geProjectiveMatrix3.h"
 #include "rcExUtil.h"
+#include "rsCubeDeepShadowMap.h"
 #include "rsCubeShadowMap.h"
+#include "rsDeepShadowMap.h"
+#include "rsFZBuffer.h"
+#include "rsScene.h"
 #include "rsShadingContext.h"
 #include "rsShadowMap.h"
+#include "rsShadowPass.h"
 
 namespace Zr {
 
@@ -47,20 +52,79 @@ void RsStdLightShader::setupRender(const GeAffineMatrix3<float>& worldToCamera) 
     _lightToCamera = worldToCamera * _lightToWorld;
     _position = GePoint3<float>(_lightToCamera.getTranslation());
     _cameraToLight = _lightToCamera.computeInverse();
+    _cameraToWorld = worldToCamera.computeInverse();
 }
 
-void RsStdLightShader::initializeMaps(const RCShdPtr<RsScene>&) {
+void RsStdLightShader::initializeMaps(const RCShdPtr<RsScene>& scene) {
     if (!_light) RCExUtil::throwExNullPtr("SdStdLight");
+    const SdStdLight& light = *_light;
+    if (light._shadowsActive == 0 || light._shadowsEnabled == 0) return;
+    using Type = SdStdLight::ShadowMapType;
+    const Type type = light._shadowMapType;
+    if (type != Type::ShadowMapZ && type != Type::ShadowMapMidpoint && type != Type::ShadowMapDeep) return;
+    _shadowEvaluator = renderShadowMaps(scene, type);
+}
+
+const RsShadowEvaluator* RsStdLightShader::renderSingleMap(const RCShdPtr<RsScene>& scene,
+                                                           SdStdLight::ShadowMapType type, RsShadowMap& map,
+                                                           RsDeepShadowMap& deepMap, const GeScale3<float>& scale,
+                                                           MapView view) const {
+    const int size = _light->_shadowMapSize;
+    if (type != SdStdLight::ShadowMapType::ShadowMapDeep) {
+        RsShadowPass::renderDepthMap(type, map.getMap(), size, map.getWorldToShadowMapMatrix(),
+                                     map.getProjectionMatrix(), scene);
+        return &map;
+    }
+    const GeAffineMatrix3<float> worldToLight = _lightToWorld.computeInverse();
+    GeProjectiveMatrix3<float> projection;
+    const bool fitted = RsShadowPass::fitDeepProjection(worldToLight, scale, view == MapView::perspective, *scene,
+                                                        projection);
+    if (fitted) deepMap.setMatrices(worldToLight, projection);
+    deepMap.setCameraMatrix(_cameraToWorld);
+    deepMap.allocateMap();
+    // Without a depth range in front of the light nothing casts a shadow: the curves stay empty.
+    if (fitted) RsShadowPass::renderDeepMap(deepMap, scene);
+    return &deepMap;
+}
+
+const RsShadowEvaluator* RsStdLightShader::renderCubeMaps(const RCShdPtr<RsScene>& scene,
+                                                          SdStdLight::ShadowMapType type, RsCubeShadowMap& map,
+                                                          RsCubeDeepShadowMap& deepMap) const {
+    const GePoint3<float> center(_lightToWorld.getTranslation());
+    const int size = _light->_shadowMapSize;
+    if (type != SdStdLight::ShadowMapType::ShadowMapDeep) {
+        map.setMapsCenter(center, scene);
+        map.setCameraMatrix(_cameraToWorld);
+        for (int f = 0; f < RsCubeShadowMap::kFaceCount; ++f) {
+            const auto face = static_cast<RsCubeShadowMap::CubeFace>(f);
+            RsShadowPass::renderDepthMap(type, map.getMap(face), size, map.getWorldToShadowMapMatrix(face),
+                                         map.getProjectionMatrix(face), scene);
+        }
+        return &map;
+    }
+    deepMap.setMapsCenter(center, scene);
+    deepMap.setCameraMatrix(_cameraToWorld);
+    // The six passes draw into fragment buffers of one size, one after the other: they share
+    // one buffer's memory.
+    RsFZBufferMemory memory;
+    for (int f = 0; f < RsCubeDeepShadowMap::kFaceCount; ++f)
+        RsShadowPass::renderDeepMap(deepMap.getMap(static_cast<RsCubeDeepShadowMap::CubeFace>(f)), scene, &memory);
+    return &deepMap;
 }
 
 void RsStdLightShader::lockMemoryImpl() {}
 
 void RsStdLightShader::unlockMemoryImpl() {}
 
-void RsStdLightShader::setUpShadowMap(RsCubeShadowMap& map) const { takeMapSettings(map, *_light); }
-
-void RsStdLightShader::setUpShadowMap(RsShadowMap& map, const GeScale3<float>& scale, MapView view) const {
+void RsStdLightShader::setUpShadowMap(RsCubeShadowMap& map, RsCubeDeepShadowMap& deepMap) const {
     takeMapSettings(map, *_light);
+    takeMapSettings(deepMap, *_light);
+}
+
+void RsStdLightShader::setUpShadowMap(RsShadowMap& map, RsDeepShadowMap& deepMap, const GeScale3<float>& scale,
+                                      MapView view) const {
+    takeMapSettings(map, *_light);
+    takeMapSettings(deepMap, *_light);
     // Only the depth part differs: a perspective divides by the distance in front of the light,
     // a parallel view keeps w at 1.
     GeProjectiveMatrix3<float> projection = scale.toProjective();

@@ -20,7 +20,9 @@
 
 namespace Zr {
 
+class RsCubeDeepShadowMap;
 class RsCubeShadowMap;
+class RsDeepShadowMap;
 class RsShadowMap;
 
 class RsStdLightShader : public RsLightShader {
@@ -33,7 +35,10 @@ public:
     // Places the light in the camera space of worldToCamera: _lightToCamera, its inverse and the
     // light's origin. Lights that place more call this first.
     void setupRender(const GeAffineMatrix3<float>& worldToCamera) override;
-    // No shadow maps are rendered yet: the light stays unshadowed.
+    // Renders the light's shadow maps of its map type for the coming picture and makes them the
+    // light's shadow evaluator. Nothing happens while either shadow flag of the light is zero, or
+    // for a map type outside the three: the evaluator stays as it was (none on a new light). A
+    // null light is reported as a null pointer failure.
     void initializeMaps(const RCShdPtr<RsScene>& scene) override;
 
     // The light's colour as it passes the shadows at the fragment, per channel: white where the
@@ -60,11 +65,26 @@ protected:
     void lockMemoryImpl() override;
     void unlockMemoryImpl() override;
 
-    // Gives the light's own map its size, bias and filter range from the light. A single map also
-    // takes its matrices: the light's view from world space, and a projection of x and y scaled
-    // by scale with depths from 0.001 to 100 in front of the light, in the way view says.
-    void setUpShadowMap(RsCubeShadowMap& map) const;
-    void setUpShadowMap(RsShadowMap& map, const GeScale3<float>& scale, MapView view) const;
+    // Gives the light's own maps their size, bias and filter range from the light. A single plain
+    // map also takes its matrices: the light's view from world space, and a projection of x and y
+    // scaled by scale with depths from 0.001 to 100 in front of the light, in the way view says.
+    void setUpShadowMap(RsCubeShadowMap& map, RsCubeDeepShadowMap& deepMap) const;
+    void setUpShadowMap(RsShadowMap& map, RsDeepShadowMap& deepMap, const GeScale3<float>& scale,
+                        MapView view) const;
+
+    // Renders the maps of the type (one of the three) for the coming picture; returns the one
+    // that is to answer the shadow queries.
+    virtual const RsShadowEvaluator* renderShadowMaps(const RCShdPtr<RsScene>& scene,
+                                                      SdStdLight::ShadowMapType type) = 0;
+    // The passes of a single map: a depth pass into the plain map, or a deep pass into the deep
+    // map, whose depth range is first fitted to the scene along the light (scale and view as for
+    // setUpShadowMap).
+    const RsShadowEvaluator* renderSingleMap(const RCShdPtr<RsScene>& scene, SdStdLight::ShadowMapType type,
+                                             RsShadowMap& map, RsDeepShadowMap& deepMap,
+                                             const GeScale3<float>& scale, MapView view) const;
+    // The six passes of a cube around the light, one per face in face order.
+    const RsShadowEvaluator* renderCubeMaps(const RCShdPtr<RsScene>& scene, SdStdLight::ShadowMapType type,
+                                            RsCubeShadowMap& map, RsCubeDeepShadowMap& deepMap) const;
 
     // Multiplies strength by the light's falloff at distance; false, with strength unchanged,
     // when the falloff is not positive and the light does not reach that far. A light without
@@ -106,6 +126,8 @@ protected:
     GeAffineMatrix3<float> _lightToCamera;
     GeAffineMatrix3<float> _cameraToLight;
     GePoint3<float> _position;
+    // The render call's camera space to world space, for the maps' queries; set by setupRender.
+    GeAffineMatrix3<float> _cameraToWorld;
 };
 
 }  // namespace Zr

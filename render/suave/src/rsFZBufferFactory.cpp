@@ -1,12 +1,10 @@
 #include "rsFZBufferFactory.h"
 
-#include "assertions.h"
+#include "rsDeepShadowMap.h"
 
 namespace Zr {
 
 namespace {
-constexpr const char* kSourceFile = "render\\suave\\src\\rsFZBufferFactory";
-
 // The fill colour of a new factory: no colour, full coverage.
 constexpr CoRgbaColorTyped<float> kOpaqueBlack(0.0f, 0.0f, 0.0f, 1.0f);
 }  // namespace
@@ -18,11 +16,9 @@ GeRectangle<int> RsFZBufferFactory::getPixelRegion() const {
     return _output._rectangle;
 }
 
-// The region of the deep shadow map needs the map's own class, which this build does not have
-// yet: until it comes, a factory directed at a map stops here. Setting a map as output is
-// harmless by itself.
 GeRectangle<int> RsFZBufferFactory::getDeepShadowMapRegion() const {
-    Assertions::throwProgramAborted(kSourceFile, __LINE__, "deep shadow map output is not available");
+    const int size = static_cast<int>(_deepShadowMap->getSize());
+    return {0, size, 0, size};
 }
 
 RCShdPtr<RsFZBuffer> RsFZBufferFactory::createBuffer(const GeRectangle<int>& region) const {

@@ -5,9 +5,10 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <vector>
 
-#include "assertions.h"
 #include "osMemoryArch.h"
+#include "rsDeepShadowMap.h"
 #include "rsFZBuffer.h"
 #include "rsImageCreatorUtil.h"
 #include "rsTolerance.h"
@@ -15,8 +16,6 @@
 namespace Zr {
 
 namespace {
-
-constexpr const char* kSourceFile = "render\\suave\\src\\rsImageCreatorFZ";
 
 using Rgba = RsImageCreatorFZ::Rgba;
 
@@ -140,10 +139,36 @@ void RsImageCreatorFZ::createImage(RsFragment* const* lists, const GeRectangle<i
     }
 }
 
-// Needs the deep shadow map's own class, which this build does not have yet: until it comes, a
-// buffer directed at a map stops here rather than producing nothing in silence.
-void RsImageCreatorFZ::createDeepShadowMap(RsFZBuffer&, int, int, int, int, RsDeepShadowMap&) {
-    Assertions::throwProgramAborted(kSourceFile, __LINE__, "deep shadow map output is not available");
+void RsImageCreatorFZ::createDeepShadowMap(RsFZBuffer& buffer, int x, int y, int width, int height,
+                                           RsDeepShadowMap& map) {
+    using Element = RsTransmittanceFunction::Element;
+    const int intSize = static_cast<int>(map.getSize());
+    // Two curves for the whole region: the fragments far to near as they come, then the product
+    // of their transmittances near to far. Their room is kept from pixel to pixel.
+    std::vector<Element> fragments;
+    std::vector<Element> curve;
+    fragments.reserve(10);
+    curve.reserve(10);
+    RsFragment* const* lists = buffer.getLists();
+    for (int row = 0; row < height; ++row) {
+        RsFragment* const* heads = lists + std::ptrdiff_t(row) * width;
+        const int first = (y + row) * intSize + x;
+        for (int i = 0; i < width; ++i) {
+            if (heads[i] == nullptr) continue;  // no caster: the function stays empty
+            fragments.clear();
+            curve.clear();
+            for (const RsFragment* f = heads[i]; f != nullptr; f = f->_next)
+                fragments.push_back({static_cast<float>(f->_depth), {f->_color.r, f->_color.g, f->_color.b}});
+            CoRgbColorTyped<float> passed(1.0f);
+            for (auto e = fragments.rbegin(); e != fragments.rend(); ++e) {
+                passed *= e->transmittance;
+                curve.push_back({e->depth, passed});
+                // Nothing comes through behind a black layer.
+                if (passed.r == 0.0f && passed.g == 0.0f && passed.b == 0.0f) break;
+            }
+            map.setFunction(first + i, curve.data(), static_cast<int>(curve.size()));
+        }
+    }
 }
 
 }  // namespace Zr

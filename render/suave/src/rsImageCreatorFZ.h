@@ -45,8 +45,11 @@ public:
                             float weight, bool unpremultiply, const Rgba& fillColor,
                             const IxReadGuard& background, const IxWriteGuard& output);
 
-    // Turns the fragments of the buffer's pixels x .. x + width, y .. y + height into the deep
-    // shadow map. Comes with the deep shadow map; until then it aborts.
+    // Turns the fragments of the buffer's pixels x .. x + width, y .. y + height (map cells) into
+    // the deep shadow map's curves. Each fragment's colour is the transmittance of its layer; a
+    // pixel's curve is the running product of its layers from the nearest on, one step per layer,
+    // and ends at the first layer behind which all three channels are exactly 0. Alpha is not
+    // read. A pixel without fragments keeps its empty curve.
     static void createDeepShadowMap(RsFZBuffer& buffer, int x, int y, int width, int height, RsDeepShadowMap& map);
 
     RsImageCreatorFZ() = delete;

@@ -52,7 +52,8 @@ public:
           _orthographic(orthographic),
           _clipperPlain(region),
           _clipperNormal(region),
-          _clipperTangent(region) {}
+          _clipperTangent(region),
+          _clipperDepth(region) {}
 
     RsRegionDrawer(const RsRegionDrawer&) = delete;
     RsRegionDrawer& operator=(const RsRegionDrawer&) = delete;
@@ -68,6 +69,7 @@ public:
         _clipperPlain.setClipFlags(planes);
         _clipperNormal.setClipFlags(planes);
         _clipperTangent.setClipFlags(planes);
+        _clipperDepth.setClipFlags(planes);
         _vertices = &vertices;
     }
 
@@ -113,6 +115,13 @@ public:
             else
                 drawFacesPlain(firstFace, endFace);
         }
+    }
+
+    // Shadow maps: draws faces firstFace up to endFace of the instance as depth alone, with no
+    // material: the solid path's tests and clipping with depth vertices (eye z) into the buffer's
+    // depth rasterizer.
+    void drawDepthFaces(unsigned int firstFace, unsigned int endFace) {
+        drawSolidFaces<RsDepthVertex>(firstFace, endFace);
     }
 
 private:
@@ -207,12 +216,12 @@ private:
         }
         if (front ? !_drawFrontFaces : !_drawBackFaces) return false;
 
-        const SdMesh& mesh = data.getMesh();
         for (int c = 0; c < 3; ++c) {
             V& v = corners[c];
             const unsigned int vi = face.getVertexIndex(c);
             v._pixCoord = GeHomogeneousCoord3<double>(data.getPixelPositions()[vi]);
-            v._eyeCoord = GePoint3<double>(positions[vi]);
+            if constexpr (RsHasEyeZ<V>) v._eyeZ = positions[vi].z;  // a depth vertex has nothing more
+            else v._eyeCoord = GePoint3<double>(positions[vi]);
             if constexpr (RsHasNormal<V>) {
                 const unsigned int ni = face.getNormalIndex(c);
                 const GeVector3<float>& n = normals[ni];
@@ -227,11 +236,13 @@ private:
                     v._tangent = GePoint3<double>(w.x, w.y, w.z);
                 }
             }
-            if (data.hasTexCoords()) {
-                v._texCoord = GePoint3<double>(mesh.getTextureCoordinates()[face.getTextureIndex(c)]);
-            } else {
-                // Without texture coordinates the face's own barycentric frame stands in.
-                v._texCoord = GePoint3<double>(c == 0 ? 1.0 : 0.0, c == 1 ? 1.0 : 0.0, c == 2 ? 1.0 : 0.0);
+            if constexpr (RsHasTexCoord<V>) {
+                if (data.hasTexCoords()) {
+                    v._texCoord = GePoint3<double>(data.getMesh().getTextureCoordinates()[face.getTextureIndex(c)]);
+                } else {
+                    // Without texture coordinates the face's own barycentric frame stands in.
+                    v._texCoord = GePoint3<double>(c == 0 ? 1.0 : 0.0, c == 1 ? 1.0 : 0.0, c == 2 ? 1.0 : 0.0);
+                }
             }
         }
         return true;
@@ -253,6 +264,7 @@ private:
     RsPolygonClipper<V>& clipperFor() {
         if constexpr (std::is_same_v<V, RsPlainVertex>) return _clipperPlain;
         else if constexpr (std::is_same_v<V, RsNormalVertex>) return _clipperNormal;
+        else if constexpr (std::is_same_v<V, RsDepthVertex>) return _clipperDepth;
         else {
             static_assert(std::is_same_v<V, RsTangentVertex>, "no clipper for this vertex kind");
             return _clipperTangent;
@@ -265,6 +277,7 @@ private:
     RsPolygonClipper<RsPlainVertex> _clipperPlain;
     RsPolygonClipper<RsNormalVertex> _clipperNormal;
     RsPolygonClipper<RsTangentVertex> _clipperTangent;
+    RsPolygonClipper<RsDepthVertex> _clipperDepth;
     bool _drawFrontFaces = true;
     bool _drawBackFaces = true;
     float _depthOffset = 0.0f;

@@ -62,6 +62,19 @@ public:
         renderPieces(instances, vertices, region);
     }
 
+    // The shadow pass of a light: draws the instances into the factory's whole pixel region as one
+    // region, however large, since a map must not be cut. A depth buffer takes the faces' depths
+    // alone; a fragment buffer draws each face group with the instance's shadow shader, whose
+    // colour is what the surface lets through. No instance is offset in depth.
+    void renderShadowPass(const RsGeomInstanceList& instances) {
+        std::vector<RsInstanceVertices> vertices;
+        vertices.reserve(instances.size());
+        for (const RCShdPtr<RsGeomInstance>& instance : instances)
+            vertices.emplace_back(*instance, _pixelMatrix, true, false);
+        _shadowPass = true;
+        renderLeaf(instances, vertices, _factory->getPixelRegion());
+    }
+
     const GeProjectiveMatrix3<double>& getProjection() const { return _projection; }
     const GeAffineMatrix3<float>& getWorldToCamera() const { return _worldToCamera; }
 
@@ -97,10 +110,15 @@ private:
 
     void renderLeaf(const RsGeomInstanceList& instances, std::vector<RsInstanceVertices>& vertices,
                     const GeRectangle<int>& region) {
-        RCShdPtr<Buffer> buffer = _factory->createBuffer(region);
+        RCShdPtr<Buffer> buffer(_factory->createBuffer(region));  // depth factories hand out a plain pointer
         {
             RsRegionDrawer<Buffer> drawer(buffer, region, _orthographic);
-            for (std::size_t i = 0; i < instances.size(); ++i) drawInstance(drawer, *instances[i], vertices[i]);
+            for (std::size_t i = 0; i < instances.size(); ++i) {
+                if constexpr (requires { requires Buffer::kDepthOnly; })
+                    drawDepthInstance(drawer, *instances[i], vertices[i]);
+                else
+                    drawInstance(drawer, *instances[i], vertices[i]);
+            }
             buffer->finalize();
         }
     }
@@ -116,21 +134,27 @@ private:
         return false;
     }
 
-    static void drawInstance(RsRegionDrawer<Buffer>& drawer, const RsGeomInstance& geom,
-                             RsInstanceVertices& vertices) {
+    void drawInstance(RsRegionDrawer<Buffer>& drawer, const RsGeomInstance& geom, RsInstanceVertices& vertices) {
         const SdMesh& mesh = *geom._mesh;
         const unsigned int groups = mesh.getFaceGroupCount();
-        const RsGeomInstance::MaterialList& materials = geom._materials;
+        const RsGeomInstance::MaterialList& materials = _shadowPass ? geom._shadowMaterials : geom._materials;
         const std::size_t materialCount = materials.size();
         // Face group g takes material g modulo the count, which needs a material.
         constexpr const char* kSourceFile = "render\\suave\\src\\rsSceneRenderer";
         ZR_ASSERT_AT(groups == 0 || materialCount != 0, kSourceFile, __LINE__);
-        drawer.setInstance(geom, vertices, true);
+        drawer.setInstance(geom, vertices, !_shadowPass);
         for (unsigned int g = 0; g < groups; ++g) {
             const SdMeshTypes::FaceGroup& group = mesh.getFaceGroup(g);
             drawer.drawFaces(materials[g % materialCount], group._firstFace,
                              group._firstFace + group._faceCount);
         }
+    }
+
+    // A depth buffer takes every face of the instance as depth alone, with no material.
+    static void drawDepthInstance(RsRegionDrawer<Buffer>& drawer, const RsGeomInstance& geom,
+                                  RsInstanceVertices& vertices) {
+        drawer.setInstance(geom, vertices, false);
+        drawer.drawDepthFaces(0, geom._mesh->getFaceCount());
     }
 
     Factory* _factory;
@@ -139,6 +163,7 @@ private:
     GeProjectiveMatrix3<float> _pixelMatrix;
     GeAffineMatrix3<float> _worldToCamera;
     bool _orthographic = false;
+    bool _shadowPass = false;  // drawing a light's map rather than the camera's picture
 };
 
 }  // namespace Zr

@@ -1,0 +1,47 @@
+#include "rsMZBuffer.h"
+
+#include <algorithm>
+#include <cstddef>
+
+namespace Zr {
+
+RsMZBuffer::RsMZBuffer(int width, int height, double* depth)
+    : _width(width), _height(height), _depth(depth), _rasterizer(*this, &RsMZBuffer::drawSpan) {
+    const std::size_t pixels = static_cast<std::size_t>(width) * static_cast<std::size_t>(height);
+    std::fill_n(_depth, pixels, kEmptyDepth);
+    _secondDepth = std::make_unique_for_overwrite<double[]>(pixels);
+    std::fill_n(_secondDepth.get(), pixels, kEmptyDepth);
+}
+
+void RsMZBuffer::drawSpan(const Context&, int row, const Span& span, RsPixelData<RsDepthVertex>& data) {
+    const std::ptrdiff_t rowStart = std::ptrdiff_t(row) * _width;
+    double* const first = _depth + rowStart;
+    double* const second = _secondDepth.get() + rowStart;
+    for (int x = span._x1; x < span._x2; ++x) {
+        const double depth = data._eyeZ._q / data._w._q;
+        if (depth > second[x]) {
+            // A surface level with the nearest becomes the second one.
+            if (depth > first[x]) {
+                second[x] = first[x];
+                first[x] = depth;
+            } else {
+                second[x] = depth;
+            }
+        }
+        data.stepX();
+    }
+}
+
+void RsMZBuffer::finalize() {
+    const std::size_t pixels = static_cast<std::size_t>(_width) * static_cast<std::size_t>(_height);
+    const double* const second = _secondDepth.get();
+    // Halved before adding: two lowest doubles would overflow their sum.
+    for (std::size_t i = 0; i < pixels; ++i) _depth[i] = _depth[i] * 0.5 + second[i] * 0.5;
+}
+
+void RsMZBuffer::dump(std::ostream& os) const {
+    os << " _width: " << _width << " _height: " << _height << " _depth: " << static_cast<const void*>(_depth)
+       << " _secondDepth: " << static_cast<const void*>(_secondDepth.get());
+}
+
+}  // namespace Zr
