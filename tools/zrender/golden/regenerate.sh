@@ -12,6 +12,9 @@ golden="$root/tools/zrender/golden"
 "$build/tools/zrender" --size 400x300 -o "$golden/sample-400x300.png"
 "$build/tools/zrender" --size 400x300 --no-zbuffer -o "$golden/sample-400x300-no-zbuffer.png"
 
+# The two other shadow map types (the pictures above have depth maps).
+"$build/tools/zrender" --size 160x120 --shadows midpoint -o "$golden/sample-160x120-midpoint.png"
+"$build/tools/zrender" --size 160x120 --shadows deep -o "$golden/sample-160x120-deep.png"
 # Real model files from the assimp-testmodels package: OBJ with textures, glTF 2.0 and PLY.
 models=/usr/share/assimp/models
 "$build/tools/zrender" "$models/OBJ/spider.obj" --size 160x120 -o "$golden/model-spider-obj.png"
