@@ -35,12 +35,15 @@ std::uint16_t coverageAt(const Span& span, int px) {
     return static_cast<std::uint16_t>(mask);
 }
 
-// The samples of n, among mask, where n's plane lies at or behind f's.
-std::uint16_t samplesBehind(const RsAFragment& n, const RsAFragment& f, std::uint16_t mask) {
+// The samples of n, among the shared ones, where n's plane lies at or behind f's. Where the depth
+// intervals do not overlap, they decide for all samples at once.
+unsigned int sharedSamplesBehind(const RsAFragment& n, const RsAFragment& f, unsigned int shared) {
+    if (f._zMin > n._zMax) return 0;
+    if (n._zMin >= f._zMax) return shared;
     unsigned int behind = 0;
     for (int i = 0; i < RsAFragment::kSamples; ++i)
-        if ((mask >> i) & 1u) behind |= static_cast<unsigned int>(n.depthAt(i) >= f.depthAt(i)) << i;
-    return static_cast<std::uint16_t>(behind);
+        if ((shared >> i) & 1u) behind |= static_cast<unsigned int>(n.depthAt(i) >= f.depthAt(i)) << i;
+    return behind;
 }
 
 }  // namespace
@@ -166,15 +169,40 @@ void RsABuffer::drawSpanZ(const Context& context, int row, const Span& span, RsP
 }
 
 void RsABuffer::insertByDepth(RsAFragment*& head, RsAFragment* n, double& nearest, bool closesPixel) {
+    if (closesPixel) nearest = std::min(n->_zMax, nearest);
+    const auto linkAfter = [&head](RsAFragment* prev, RsAFragment* f) {
+        RsAFragment*& link = prev == nullptr ? head : prev->_next;
+        f->_next = link;
+        link = f;
+    };
+
+    // The samples of n where it lies in front of some fragment that covers them, and those where
+    // it lies at or behind one (ties count n as behind). The list is ordered at every sample, so
+    // once a sample has met a fragment that n lies behind, all later ones that cover it lie nearer.
+    unsigned int inFront = 0;
+    unsigned int behindSome = 0;
+    RsAFragment* beforeFirstBehind = nullptr;  // the fragment before the first that n lies behind
+    RsAFragment* last = nullptr;
+    for (RsAFragment* cur = head; cur != nullptr && behindSome != n->_coverage; last = cur, cur = cur->_next) {
+        const unsigned int shared = n->_coverage & cur->_coverage & ~behindSome;
+        if (shared == 0) continue;
+        const unsigned int behind = sharedSamplesBehind(*n, *cur, shared);
+        if (behind != 0 && behindSome == 0) beforeFirstBehind = last;
+        behindSome |= behind;
+        inFront |= shared & ~behind;
+    }
+    // Most often n lies behind all it meets, or in front of all: it goes in whole.
+    if (inFront == 0) return linkAfter(beforeFirstBehind, n);
+    if (behindSome == 0) return linkAfter(last, n);
+    insertSplit(head, n);
+}
+
+void RsABuffer::insertSplit(RsAFragment*& head, RsAFragment* n) {
     constexpr int kSamples = RsAFragment::kSamples;
     constexpr int kEnd = INT_MAX;  // the position after the list's last fragment
-    if (closesPixel) nearest = std::min(n->_zMax, nearest);
-
     // Where each sample of n may go, as positions between the list's fragments (position k lies
     // just before fragment k): after the last fragment that covers the sample and lies behind n
-    // there, and at the latest just before the first one that covers it and does not. The list is
-    // ordered at every sample, so the first holds for all fragments before the second. Depth
-    // intervals that do not overlap decide without looking at the samples; ties count n as behind.
+    // there, and at the latest just before the first one that covers it and does not.
     int after[kSamples];
     int before[kSamples];
     std::fill(after, after + kSamples, -1);
@@ -184,10 +212,7 @@ void RsABuffer::insertByDepth(RsAFragment*& head, RsAFragment* n, double& neares
     for (const RsAFragment* cur = head; cur != nullptr && open != 0; cur = cur->_next, ++k) {
         const unsigned int shared = open & cur->_coverage;
         if (shared == 0) continue;
-        unsigned int behind = 0;  // samples where n lies at or behind cur
-        if (cur->_zMin > n->_zMax) behind = 0;
-        else if (n->_zMin >= cur->_zMax) behind = shared;
-        else behind = samplesBehind(*n, *cur, static_cast<std::uint16_t>(shared));
+        const unsigned int behind = sharedSamplesBehind(*n, *cur, shared);
         for (int i = 0; i < kSamples; ++i) {
             if (((shared >> i) & 1u) == 0) continue;
             if ((behind >> i) & 1u) before[i] = k;
@@ -218,13 +243,9 @@ void RsABuffer::insertByDepth(RsAFragment*& head, RsAFragment* n, double& neares
         for (RsAFragment* following = prev == nullptr ? head : prev->_next; next < position && following != nullptr;
              following = following->_next, ++next)
             prev = following;
-        if (prev == nullptr) {
-            record->_next = head;
-            head = record;
-        } else {
-            record->_next = prev->_next;
-            prev->_next = record;
-        }
+        RsAFragment*& link = prev == nullptr ? head : prev->_next;
+        record->_next = link;
+        link = record;
         prev = record;
         record = nullptr;
     }

@@ -124,6 +124,8 @@ private:
     // different places. closesPixel: n is an interior opaque fragment, which lowers the pixel's
     // Z-buffer.
     void insertByDepth(RsAFragment*& head, RsAFragment* n, double& nearest, bool closesPixel);
+    // The general case of the above: n lies in front of some fragments and behind others.
+    void insertSplit(RsAFragment*& head, RsAFragment* n);
 
     int _x;
     int _y;
