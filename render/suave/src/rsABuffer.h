@@ -40,6 +40,15 @@
 
 namespace Zr {
 
+// What an A-buffer allocates, handed on from one region's buffer to the next.
+struct RsABufferMemory {
+    std::size_t _pixels = 0;  // the length of each per-pixel array
+    std::unique_ptr<std::uint16_t[]> _closed;
+    std::unique_ptr<double[]> _zBuffer;
+    std::unique_ptr<RsAFragment*[]> _lists;
+    std::unique_ptr<RsFragmentPool> _pool;
+};
+
 class RsABuffer : public RCObject, public IxTileManip {
 public:
     using Rgba = CoRgbaColorTyped<float>;
@@ -53,8 +62,10 @@ public:
 
     // A buffer for the pixels x <= px < x + width, y <= py < y + height, with a Z-buffer when
     // zBuffer is set. unpremultiply is handed to the resolve. The fill colour starts as opaque
-    // black, the guards empty, the kernel the box.
-    RsABuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply);
+    // black, the guards empty, the kernel the box. memory, when given, lends its arrays and pool
+    // and must outlive the buffer, which gives them back when it dies.
+    RsABuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply,
+              RsABufferMemory* memory = nullptr);
     ~RsABuffer() override;
     RsABuffer(const RsABuffer&) = delete;
     RsABuffer& operator=(const RsABuffer&) = delete;
@@ -142,6 +153,8 @@ private:
     std::unique_ptr<double[]> _zBuffer;
     std::unique_ptr<RsAFragment*[]> _lists;
     std::unique_ptr<RsFragmentPool> _pool;
+    RsABufferMemory* _memory;
+    std::size_t _arrayPixels = 0;  // the length of the per-pixel arrays, at least the pixel count
     Rasterizer<RsTangentVertex> _rasterizerTangent;
     Rasterizer<RsNormalVertex> _rasterizerNormal;
     Rasterizer<RsPlainVertex> _rasterizerPlain;

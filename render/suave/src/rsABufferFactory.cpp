@@ -17,7 +17,7 @@ GeRectangle<int> RsABufferFactory::getPixelRegion() const {
 
 RCShdPtr<RsABuffer> RsABufferFactory::createBuffer(const GeRectangle<int>& region) const {
     RCShdPtr<RsABuffer> buffer = makeShared<RsABuffer>(region.x0, region.y0, region.getWidth(), region.getHeight(),
-                                                       _zBuffer, _unpremultiply);
+                                                       _zBuffer, _unpremultiply, &_memory);
     buffer->setOutput(_output, _background, _fillColor, _accumulate, _weight, _kernel);
     return buffer;
 }

@@ -58,6 +58,8 @@ private:
     IxTileManip::ReadGuardNoCheck _background;
     bool _unpremultiply = true;
     RsFilterKernel _kernel{RsFilterKernel::KernelBox};
+    // Handed from each region's buffer to the next; the buffers die before the factory.
+    mutable RsABufferMemory _memory;
 };
 
 }  // namespace Zr
