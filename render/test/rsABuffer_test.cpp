@@ -94,6 +94,90 @@ TEST(RsABuffer, RendersAgreeWithThePerSampleReference) {
     }
 }
 
+// Fragments offered one after the other to one pixel through hand-made spans, with masks at
+// random (some whole, which take the interior run), planes from a few tilted ones so that samples
+// often tie, opaque or not. Without Z a fragment is made when it covers a sample left open,
+// keeps its whole mask and goes at the head; with Z it is made unless its near end lies at or
+// behind a whole opaque fragment's far end, and at every sample the fragments that cover it lie
+// from far to near, a newcomer behind those level with it there. Depths are binary fractions, so
+// the model's are exact.
+TEST(RsABuffer, OfferedFragmentsListAsTheModelSays) {
+    std::mt19937 rng(31);
+    for (int trial = 0; trial < 300; ++trial) {
+        const bool zBuffer = trial % 2 == 0;
+        RsABuffer buffer(0, 0, 1, 1, zBuffer, true);
+        std::vector<RCShdPtr<TestMaterial>> materials;
+        std::vector<std::vector<int>> expected(16);  // per sample with Z; else entry 0, head first
+        std::uint16_t closed = 0;
+        double nearest = RsABuffer::kEmptyDepth;
+        double planes[6][3];
+        std::uint16_t masks[6];
+        int made = 0;
+        for (int id = 0; id < 6; ++id) {
+            const std::uint16_t mask = rng() % 3 == 0 ? 0xffff : static_cast<std::uint16_t>(rng());
+            const double z0 = double(1 + rng() % 3) / 4, dx = (double(rng() % 3) - 1) / 16, dy = (double(rng() % 3) - 1) / 8;
+            const bool opaque = rng() % 2 == 0;
+            masks[id] = mask;
+            materials.push_back(makeShared<TestMaterial>(Rgba(float(id), 0.0f, 0.0f, opaque ? 1.0f : 0.5f)));
+            RsDrawContext context;
+            context._transfer = RsTransferFunc::getFunction(Mode::normal);
+            context._canBeOpaque = true;
+            context._material = materials.back().get();
+            RsABuffer::Span span;
+            span.resetExtents();
+            for (int i = 0; i < 16; ++i) {
+                if (mask == 0xffff) span.store(i, 0, 16);
+                else if ((mask >> i) & 1) span.store(i, kPattern[i], kPattern[i] + 1);
+                else span.markMissed(i);
+            }
+            RsPixelData<RsPlainVertex> data{};
+            data._w._q = 1.0;
+            data._z._q = z0;
+            data._z._dq_dx = dx;
+            data._z._dq_dy = dy;
+            data._z._slope = (std::abs(dx) + std::abs(dy)) / 2;
+            if (zBuffer) buffer.drawSpanZ(context, 0, span, data);
+            else buffer.drawSpanNoZ(context, 0, span, data);
+
+            if (zBuffer ? mask == 0 || !(nearest > z0 - data._z._slope) : (mask & ~closed) == 0) continue;
+            ++made;
+            if (!zBuffer) {
+                expected[0].insert(expected[0].begin(), id);
+                if (opaque) closed |= mask;
+                continue;
+            }
+            if (opaque && mask == 0xffff) nearest = std::min(nearest, z0 + data._z._slope);
+            const auto depth = [&](int k, int i) {  // the plane of offer k at sample i, exactly
+                return planes[k][0] + planes[k][1] * ((kPattern[i] + 0.5) / 16 - 0.5) +
+                       planes[k][2] * ((i + 0.5) / 16 - 0.5);
+            };
+            planes[id][0] = z0, planes[id][1] = dx, planes[id][2] = dy;
+            for (int i = 0; i < 16; ++i) {
+                if (((mask >> i) & 1) == 0) continue;
+                std::vector<int>& list = expected[i];
+                auto at = list.begin();
+                while (at != list.end() && depth(*at, i) > depth(id, i)) ++at;
+                list.insert(at, id);
+            }
+        }
+        int calls = 0;
+        for (const auto& m : materials) calls += m->_calls;
+        std::vector<std::vector<int>> got(16);
+        for (const RsAFragment* f = buffer.getLists()[0]; f != nullptr; f = f->_next) {
+            const int id = int(f->_color.r);
+            if (!zBuffer) {
+                got[0].push_back(id);
+                EXPECT_EQ(f->_coverage, masks[id]) << "trial " << trial << ": the whole mask";
+            }
+            for (int i = 0; zBuffer && i < 16; ++i)
+                if ((f->_coverage >> i) & 1) got[i].push_back(id);
+        }
+        EXPECT_EQ(got, expected) << "trial " << trial;
+        EXPECT_EQ(calls, made) << "trial " << trial;
+        if (HasFailure()) return;
+    }
+}
+
 // The corners of a grid of cells x cells over [x0, x1) x [y0, y1) on the 1/256 pixel grid, the inner
 // ones moved at random by up to a third of a cell, and its two triangles per cell, cut along either
 // diagonal: a closed mesh whose triangles share every inner edge.

@@ -207,18 +207,17 @@ void RsABuffer::insertByDepth(RsAFragment*& head, RsAFragment* n, double& neares
     // once a sample has met a fragment that n lies behind, all later ones that cover it lie nearer.
     unsigned int inFront = 0;
     unsigned int behindSome = 0;
-    RsAFragment* beforeFirstBehind = nullptr;  // the fragment before the first that n lies behind
     RsAFragment* last = nullptr;
     for (RsAFragment* cur = head; cur != nullptr && behindSome != n->_coverage; last = cur, cur = cur->_next) {
         const unsigned int shared = n->_coverage & cur->_coverage & ~behindSome;
         if (shared == 0) continue;
         const unsigned int behind = sharedSamplesBehind(*n, *cur, shared);
-        if (behind != 0 && behindSome == 0) beforeFirstBehind = last;
         behindSome |= behind;
         inFront |= shared & ~behind;
     }
-    // Most often n lies behind all it meets, or in front of all: it goes in whole.
-    if (inFront == 0) return linkAfter(beforeFirstBehind, n);
+    // Most often n lies behind all it meets, or in front of all: it goes in whole, at the head or
+    // at the end (the fragments it passes there share none of its samples with it).
+    if (inFront == 0) return linkAfter(nullptr, n);
     if (behindSome == 0) return linkAfter(last, n);
     insertSplit(head, n);
 }
