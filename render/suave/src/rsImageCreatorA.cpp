@@ -6,6 +6,7 @@
 #include <memory>
 #include <vector>
 
+#include "assertions.h"
 #include "rsABuffer.h"
 #include "rsFilterTable.h"
 #include "rsImageCreatorUtil.h"
@@ -14,6 +15,8 @@
 namespace Zr {
 
 namespace {
+
+constexpr const char* kSourceFile = "render\\suave\\src\\rsImageCreatorA";
 
 using Rgba = RsImageCreatorA::Rgba;
 using Util = RsImageCreatorUtil;
@@ -26,16 +29,18 @@ struct PendingGroup {
     Rgba _color{0.0f, 0.0f, 0.0f, 1.0f};
 };
 
-// The scatter of sample groups into the ring of output rows that a source row reaches.
+// The scatter of sample groups into the ring of output rows that a source row reaches, for a
+// kernel of Support pixels (the loops over the taps then have fixed counts).
+template <int Support>
 class FilterRing {
 public:
     // Room for 256 waiting groups: more than the 16 samples can ever need.
     static constexpr std::size_t kStackSize = 256;
 
     FilterRing(const RsFilterTable& table, int width)
-        : _table(table), _n(table.getKernelSize()), _rowLength(width + 2 * table.getSupport()), _stack(kStackSize) {
-        _rows.reserve(std::size_t(_n));
-        for (int j = 0; j < _n; ++j) _rows.push_back(std::make_unique<Rgba[]>(std::size_t(_rowLength)));
+        : _table(table), _rowLength(width + 2 * Support), _stack(kStackSize) {
+        _rows.reserve(std::size_t(kTaps));
+        for (int j = 0; j < kTaps; ++j) _rows.push_back(std::make_unique<Rgba[]>(std::size_t(_rowLength)));
     }
 
     // Composites each pixel of a source row over its background colour (straight) and scatters
@@ -106,9 +111,9 @@ private:
     void scatter(int x, const Rgba& colour, unsigned int mask) {
         const float* low = _table.getLowWeights(mask & 0xffu);
         const float* high = _table.getHighWeights(mask >> 8);
-        for (int j = 0, t = 0; j < _n; ++j) {
+        for (int j = 0, t = 0; j < kTaps; ++j) {
             Rgba* row = _rows[std::size_t(j)].get() + x;
-            for (int k = 0; k < _n; ++k, ++t) {
+            for (int k = 0; k < kTaps; ++k, ++t) {
                 const float w = low[t] + high[t];
                 row[k].r += colour.r * w;
                 row[k].g += colour.g * w;
@@ -118,12 +123,64 @@ private:
         }
     }
 
+    static constexpr int kTaps = 2 * Support + 1;  // taps across one axis
+
     const RsFilterTable& _table;
-    int _n;
     int _rowLength;
     std::vector<std::unique_ptr<Rgba[]>> _rows;
     std::vector<PendingGroup> _stack;
 };
+
+// What one call resolves: its arguments, the background window, the row functions and the table.
+struct Resolve {
+    RsAFragment* const* lists;
+    const GeRectangle<int>& region;
+    bool accumulate;
+    float weight;
+    bool unpremultiply;
+    const Rgba& fillColor;
+    const IxReadGuard& background;
+    const IxWriteGuard& output;
+    const Util::BackgroundWindow& window;
+    const Util::RowFunctions& functions;
+    const RsFilterTable& table;
+};
+
+// The rows of the region, top to bottom, each composited and scattered, and the output row that it
+// completes finished and written.
+template <int Support>
+void resolveRows(const Resolve& r) {
+    const int y0 = r.region.y0, y1 = r.region.y1;
+    const int width = r.region.x1 - r.region.x0;
+    const bool scale = !RsTolerance::isEqual(r.weight, 1.0f);
+    Util::AlignedRow backgroundRow(width);
+    Rgba* const row = backgroundRow.get();
+    Util::fill(row, row + width, r.fillColor);
+    bool rowHoldsBackground = false;
+    FilterRing<Support> ring(r.table, width);
+    for (int y = y0; y < y1; ++y) {
+        if (r.window.holdsRow(y)) {
+            Util::readBackground(r.functions, r.background, r.window, y, row, width);
+            rowHoldsBackground = true;
+        } else if (rowHoldsBackground) {
+            Util::fill(row + r.window.leftPad, row + width - r.window.rightPad, r.fillColor);
+            rowHoldsBackground = false;
+        }
+        ring.compositeRow(row, r.lists + std::ptrdiff_t(y - y0) * width, width);
+
+        // The oldest ring row is output row y - Support, complete once 2 * Support rows are in.
+        if (y - y0 >= 2 * Support && width > 2 * Support) {
+            Rgba* const out = ring.oldestRow();
+            for (int e = 2 * Support; e < width; ++e) {
+                if (r.unpremultiply) Util::unpremultiply(out[e]);
+                if (scale) out[e] *= r.weight;
+            }
+            Util::writeOutput(r.functions, r.output, r.region.x0 + Support, y - Support, out + 2 * Support,
+                              width - 2 * Support);
+        }
+        ring.rotate();
+    }
+}
 
 }  // namespace
 
@@ -138,7 +195,6 @@ void RsImageCreatorA::createImage(RsAFragment* const* lists, const GeRectangle<i
                                   const RsFilterKernel& kernel, bool accumulate, float weight, bool unpremultiply,
                                   const Rgba& fillColor, const IxReadGuard& background, const IxWriteGuard& output) {
     const int support = kernel.getKernelSupport();
-    const int y0 = region.y0, y1 = region.y1;
     const int width = region.x1 - region.x0;
 
     const Util::BackgroundWindow window(background, region);
@@ -148,33 +204,13 @@ void RsImageCreatorA::createImage(RsAFragment* const* lists, const GeRectangle<i
     if (width <= 0) return;
 
     const RsFilterTable table(kernel);
-    const bool scale = !RsTolerance::isEqual(weight, 1.0f);
-    Util::AlignedRow backgroundRow(width);
-    Rgba* const row = backgroundRow.get();
-    Util::fill(row, row + width, fillColor);
-    bool rowHoldsBackground = false;
-    FilterRing ring(table, width);
-    for (int y = y0; y < y1; ++y) {
-        if (window.holdsRow(y)) {
-            Util::readBackground(functions, background, window, y, row, width);
-            rowHoldsBackground = true;
-        } else if (rowHoldsBackground) {
-            Util::fill(row + window.leftPad, row + width - window.rightPad, fillColor);
-            rowHoldsBackground = false;
-        }
-        ring.compositeRow(row, lists + std::ptrdiff_t(y - y0) * width, width);
-
-        // The oldest ring row is output row y - support, complete once 2 * support rows are in.
-        if (y - y0 >= 2 * support && width > 2 * support) {
-            Rgba* const out = ring.oldestRow();
-            for (int e = 2 * support; e < width; ++e) {
-                if (unpremultiply) Util::unpremultiply(out[e]);
-                if (scale) out[e] *= weight;
-            }
-            Util::writeOutput(functions, output, region.x0 + support, y - support, out + 2 * support,
-                              width - 2 * support);
-        }
-        ring.rotate();
+    const Resolve resolve{lists, region, accumulate, weight, unpremultiply, fillColor, background, output, window,
+                          functions, table};
+    switch (support) {
+    case 0: return resolveRows<0>(resolve);
+    case 1: return resolveRows<1>(resolve);
+    case 2: return resolveRows<2>(resolve);
+    default: Assertions::throwProgramAborted(kSourceFile, __LINE__, "filter kernel of unknown support");
     }
 }
 
