@@ -1,7 +1,8 @@
-// The anti-aliased path: the A-buffer's coverage masks on shared edges, and whole renders through
-// RsRenderer against the per-sample reference of the test support (every sample's fragments laid
-// in depth or drawing order, then filtered), in both modes and with every kernel; a flat mesh over
-// its own colour; and a picture drawn in many regions against windows drawn in one.
+// The anti-aliased path: whole renders through RsRenderer against the per-sample reference of the
+// test support (every sample's fragments laid in depth or drawing order, then filtered), in both
+// modes and with every kernel; the lists of one pixel against a model, exact ties included; the
+// coverage masks on shared edges; a flat mesh over its own colour; and a picture drawn in many
+// regions against windows drawn in one.
 #include <gtest/gtest.h>
 
 #include <bit>
