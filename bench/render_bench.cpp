@@ -1,4 +1,6 @@
-// Whole render calls of RsRenderer on the fragment Z-buffer path: the sample scene of zrender
+// Whole render calls of RsRenderer on the fragment Z-buffer path, and some of them on the
+// antialiased path (A-buffer, with the box kernel or the cubic B-spline of support 2): the sample
+// scene of zrender
 // (unlit with the host's diffuse shader, and lit as zrender draws it),
 // a mesh of about 100,000 small triangles, one quad over the same picture (the grid's time minus
 // the quad's, over 100,352, is the cost of one triangle), and ten transparent layers over the
@@ -45,9 +47,10 @@ ZrSceneKit::ShaderMaker countingShaders(std::uint64_t& count) {
     };
 }
 
-// Renders scene through camera at the size of the benchmark's two arguments, once per iteration.
+// Renders scene through camera at the size of the benchmark's first two arguments, once per
+// iteration; antialiased with the given kernel unless it is negative.
 void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const RCShdPtr<SdInstance>& camera,
-                const std::uint64_t& fragments) {
+                const std::uint64_t& fragments, int antialiasKernel = -1) {
     const int width = static_cast<int>(state.range(0));
     const int height = static_cast<int>(state.range(1));
     const GeRectangle<int> rectangle{0, width, 0, height};
@@ -55,6 +58,10 @@ void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const R
     const IxWriteGuard output(tile);
     RCShdPtr<RsRenderer> renderer = makeShared<RsRenderer>();
     renderer->setFillColor({0.16f, 0.18f, 0.23f, 1.0f});
+    if (antialiasKernel >= 0) {
+        renderer->setAntialiasing(true);
+        renderer->setFilterKernel(static_cast<RsFilterKernel::KernelType>(antialiasKernel));
+    }
 
     const std::uint64_t fragmentsBefore = fragments;
     for (auto _ : state) renderer->render(camera, scene, rectangle, output);
@@ -73,11 +80,12 @@ RCShdPtr<SdInstance> sampleCamera(const benchmark::State& state) {
 }
 
 // The sample scene's geometry, unlit, every material drawn by the host's diffuse shader.
-void BM_SampleScene(benchmark::State& state) {
+void sampleScene(benchmark::State& state, int antialiasKernel) {
     std::uint64_t fragments = 0;
     const RCShdPtr<RsScene> scene = ZrSampleScene::makeUnlitScene(countingShaders(fragments));
-    renderLoop(state, scene, sampleCamera(state), fragments);
+    renderLoop(state, scene, sampleCamera(state), fragments, antialiasKernel);
 }
+void BM_SampleScene(benchmark::State& state) { sampleScene(state, -1); }
 BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 // The sample scene as zrender draws it: three lights and the standard material. Its fragments
@@ -157,11 +165,12 @@ double aspectOf(const benchmark::State& state) {
 }
 
 // 224 by 224 cells: 100,352 triangles, about 2.6 pixels each at 512 by 512.
-void BM_SmallTriangles(benchmark::State& state) {
+void smallTriangles(benchmark::State& state, int antialiasKernel) {
     std::uint64_t fragments = 0;
     const ZrBenchScene grid = ZrBenchScenes::makeGrid(224, aspectOf(state), countingShaders(fragments));
-    renderLoop(state, grid.scene, grid.camera, fragments);
+    renderLoop(state, grid.scene, grid.camera, fragments, antialiasKernel);
 }
+void BM_SmallTriangles(benchmark::State& state) { smallTriangles(state, -1); }
 BENCHMARK(BM_SmallTriangles)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 // The same square as one quad: the same pixels, two triangles.
@@ -173,12 +182,32 @@ void BM_OneQuad(benchmark::State& state) {
 BENCHMARK(BM_OneQuad)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 // Every pixel composites ten fragments.
-void BM_TransparentLayers(benchmark::State& state) {
+void transparentLayers(benchmark::State& state, int antialiasKernel) {
     std::uint64_t fragments = 0;
     const ZrBenchScene layers = ZrBenchScenes::makeLayers(aspectOf(state), countingShaders(fragments));
-    renderLoop(state, layers.scene, layers.camera, fragments);
+    renderLoop(state, layers.scene, layers.camera, fragments, antialiasKernel);
 }
+void BM_TransparentLayers(benchmark::State& state) { transparentLayers(state, -1); }
 BENCHMARK(BM_TransparentLayers)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
+
+// The antialiased path: the third argument is the kernel, 0 the box (support 0) and 7 the cubic
+// B-spline (support 2). A fragment is a shaded pixel of a triangle, whatever its coverage.
+void antialiasedArgs(benchmark::internal::Benchmark* b) {
+    for (const int kernel : {RsFilterKernel::KernelBox, RsFilterKernel::KernelCubicBSpline}) {
+        b->Args({512, 512, kernel});
+        b->Args({1920, 1080, kernel});
+    }
+    b->Unit(benchmark::kMillisecond);
+}
+
+void BM_SampleSceneAntialiased(benchmark::State& state) { sampleScene(state, int(state.range(2))); }
+BENCHMARK(BM_SampleSceneAntialiased)->Apply(antialiasedArgs);
+
+void BM_SmallTrianglesAntialiased(benchmark::State& state) { smallTriangles(state, int(state.range(2))); }
+BENCHMARK(BM_SmallTrianglesAntialiased)->Apply(antialiasedArgs);
+
+void BM_TransparentLayersAntialiased(benchmark::State& state) { transparentLayers(state, int(state.range(2))); }
+BENCHMARK(BM_TransparentLayersAntialiased)->Apply(antialiasedArgs);
 
 }  // namespace
 

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <cmath>
 #include <cstring>
 #include <functional>
 #include <optional>
@@ -22,6 +23,7 @@
 #include "rsRasterizer.h"
 #include "rsRenderer.h"
 #include "rsShadowShader.h"
+#include "rsTransferFunc.h"
 #include "sdMeshBuilder.h"
 #include "sdTextureParams.h"
 #include "sdTextureSampler.h"
@@ -582,6 +584,94 @@ public:
     typename Buffer::Rasterizer _rasterizer;
     typename Buffer::Context _context{7};
 };
+
+// ---- The anti-aliased reference ----------------------------------------------------------------
+//
+// Each pixel has 16 samples: sample i at ((kPattern[i] + 0.5) / 16, (i + 0.5) / 16) from its
+// corner, that is on the sub-pixel grid of the rasterizer's 16 x 16 cells at column kPattern[i] of
+// row i. A grid of premultiplied sample colours over a rectangle is filtered into pixels by
+// weighting every sample within the kernel's reach by the kernel at its position seen from the
+// output pixel, in double, divided by the sum of all those weights.
+
+inline constexpr int kPattern[16] = {13, 8, 1, 4, 9, 12, 5, 0, 15, 10, 3, 6, 11, 14, 7, 2};
+
+struct SampleGrid {
+    explicit SampleGrid(const GeRectangle<int>& r) : rect(r), samples(std::size_t(r.getArea()) * 16) {}
+    Rgba& at(int x, int y, int i) {
+        return samples[(std::size_t(y - rect.y0) * rect.getWidth() + std::size_t(x - rect.x0)) * 16 + i];
+    }
+    GeRectangle<int> rect;
+    std::vector<Rgba> samples;
+};
+
+// Output pixel (x, y), premultiplied; the grid must hold every pixel within the kernel's reach.
+inline Rgba filterAt(SampleGrid& grid, const RsFilterKernel& kernel, int x, int y) {
+    const int s = kernel.getKernelSupport();
+    double sum[4] = {0, 0, 0, 0}, total = 0;
+    for (int dy = -s; dy <= s; ++dy)
+        for (int dx = -s; dx <= s; ++dx)
+            for (int i = 0; i < 16; ++i) {
+                const double w = kernel.evaluateKernel(float(dx) + (kPattern[i] + 0.5f) / 16, float(dy) + (i + 0.5f) / 16);
+                const Rgba& c = grid.at(x + dx, y + dy, i);
+                total += w;
+                sum[0] += w * c.r, sum[1] += w * c.g, sum[2] += w * c.b, sum[3] += w * c.a;
+            }
+    return Rgba(float(sum[0] / total), float(sum[1] / total), float(sum[2] / total), float(sum[3] / total));
+}
+
+inline Rgba premultiplied(const Rgba& c) { return Rgba(c.r * c.a, c.g * c.a, c.b * c.a, c.a); }
+inline Rgba straight(const Rgba& c) {
+    const float f = std::fabs(c.a) <= 1e-8f ? 0.0f : 1.0f / c.a;
+    return Rgba(c.r * f, c.g * f, c.b * f, c.a);
+}
+
+// A triangle of the screen: corners on the 1/256 pixel grid with their pixel depths, and its colour.
+struct ScreenTriangle {
+    Pt a, b, c;
+    double za, zb, zc;
+    Rgba colour;
+    SdMaterial::TransferMode mode;
+
+    // The depth of the triangle's plane at pixel position (x, y).
+    double depthAt(double x, double y) const {
+        const double ax = toPixels(a.x), ay = toPixels(a.y);
+        const double ux = toPixels(b.x) - ax, uy = toPixels(b.y) - ay, vx = toPixels(c.x) - ax, vy = toPixels(c.y) - ay;
+        const double det = ux * vy - uy * vx, px = x - ax, py = y - ay;
+        const double s = (px * vy - py * vx) / det, t = (ux * py - uy * px) / det;
+        return za + s * (zb - za) + t * (zc - za);
+    }
+};
+
+// The samples of grid.rect seen through triangles given in drawing order, over the straight start
+// colour. byDepth: at each sample, the triangles that cover it are laid far to near by their depth
+// there; otherwise the last drawn lies farthest. False when two triangles at a sample lie within
+// 1e-9 of each other in depth, which no render is asked to tell apart.
+inline bool renderSamples(const std::vector<ScreenTriangle>& triangles, bool byDepth, const Rgba& start,
+                          SampleGrid& grid) {
+    std::vector<ReferenceTriangle> coverage;
+    for (const ScreenTriangle& t : triangles) coverage.emplace_back(t.a, t.b, t.c, 0, 0, 4, 4);
+    for (int y = grid.rect.y0; y < grid.rect.y1; ++y)
+        for (int x = grid.rect.x0; x < grid.rect.x1; ++x)
+            for (int i = 0; i < 16; ++i) {
+                std::vector<std::pair<double, std::size_t>> here;  // (depth or drawing order, triangle)
+                for (std::size_t k = 0; k < triangles.size(); ++k)
+                    if (coverage[k].covers(i64(x) * 16 + kPattern[i], i64(y) * 16 + i))
+                        here.push_back({byDepth ? triangles[k].depthAt(x + (kPattern[i] + 0.5) / 16, y + (i + 0.5) / 16)
+                                                : double(k),
+                                        k});
+                std::sort(here.rbegin(), here.rend());
+                for (std::size_t k = 1; k < here.size(); ++k)
+                    if (here[k - 1].first - here[k].first < 1e-9) return false;
+                Rgba colour = premultiplied(start);
+                for (const auto& [key, k] : here) {
+                    Rgba result;
+                    RsTransferFunc::getFunction(triangles[k].mode)(triangles[k].colour, colour, result);
+                    colour = result;
+                }
+                grid.at(x, y, i) = colour;
+            }
+    return true;
+}
 
 // Counts interrupt checks, and throws a cancel at the check numbered throwAt (1-based) if set.
 class CountingInterruptHandler : public PxInterruptHandler {

@@ -53,6 +53,8 @@ int run(const ZrOptions& options) {
     const OIIO::ImageBuf reference = options.compare.empty() ? OIIO::ImageBuf() : ZrImageFile::read(options.compare);
     ZrRenderSettings settings;
     settings.zBuffer = options.zBuffer;
+    settings.antialiasing = options.antialiasing;
+    settings.filter = options.filter;
     settings.fill = options.fill;
     settings.floatPixels = storage != ZrImageFile::Storage::uint8;
     settings.threads = options.threads;

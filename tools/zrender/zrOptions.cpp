@@ -8,6 +8,8 @@
 
 #include <CLI/CLI.hpp>
 
+#include "rsFilterKernelNames.h"
+
 namespace Zr {
 
 namespace {
@@ -94,7 +96,20 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
         ->type_name("F")
         ->check(CLI::Range(0.001, 100000.0));
     app.add_flag("--float", o.floatPixels, "float pixels (OpenEXR: 32-bit float instead of half; TIFF: float)");
-    app.add_flag("--no-zbuffer{false}", o.zBuffer, "no depth test: what is drawn later lies in front");
+    app.add_flag("-a,--antialias", o.antialiasing,
+                 "antialias: sixteen samples per pixel, resolved through the --filter kernel");
+    std::map<std::string, RsFilterKernel::KernelType> kernels;
+    std::string kernelList;
+    for (int k = 0; k < RsFilterKernel::nbKernelTypes; ++k) {
+        const auto type = static_cast<RsFilterKernel::KernelType>(k);
+        kernels[RsFilterKernelNames::nameOf(type)] = type;
+        kernelList += std::string(k ? ", " : "") + RsFilterKernelNames::nameOf(type) + " (support " +
+                      std::to_string(RsFilterKernel::kernelSupport[k]) + ")";
+    }
+    app.add_option("--filter", o.filter, "the antialiasing filter kernel: " + kernelList + "; default box")
+        ->type_name("NAME")
+        ->transform(CLI::CheckedTransformer(kernels, CLI::ignore_case).description(""));
+    app.add_flag_callback("--no-zbuffer", [&o] { o.zBuffer = false; }, "no depth test: what is drawn later lies in front");
     app.add_option_function<std::string>("--fill", [&o](const std::string& v) { parseFill(v, o); },
                                          "colour where no surface is, straight, 0 to 1 (default 0.16,0.18,0.23,1)")
         ->type_name("R,G,B[,A]");
@@ -115,7 +130,7 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
                    "the lights' shadow maps: z (nearest depth, the default), midpoint (of the two nearest "
                    "depths), deep (coloured, semi-transparent shadows) or off")
         ->type_name("z|midpoint|deep|off")
-        ->transform(CLI::CheckedTransformer(shadowKinds, CLI::ignore_case));
+        ->transform(CLI::CheckedTransformer(shadowKinds, CLI::ignore_case).description(""));
     app.add_option("--shadow-map-size", o.shadows.mapSize, "side of each shadow map in texels (default 1024)")
         ->type_name("N")
         ->check(CLI::Range(16, 16384));

@@ -3,6 +3,7 @@
 #include <string>
 
 #include "coRgbaColorTyped.h"
+#include "rsFilterKernel.h"
 #include "zrShadowOptions.h"
 
 namespace Zr {
@@ -26,6 +27,8 @@ struct ZrOptions {
     double framesPerSecond = 24.0;
     bool floatPixels = false;
     bool zBuffer = true;
+    bool antialiasing = false;
+    RsFilterKernel::KernelType filter = RsFilterKernel::KernelBox;
     // Straight colour of the pixels that no surface covers: a dark blue-grey, opaque.
     CoRgbaColorTyped<float> fill{0.16f, 0.18f, 0.23f, 1.0f};
     bool info = false;

@@ -13,8 +13,10 @@ namespace {
 constexpr const char* kSourceFile = "render\\suave\\src\\rsFragmentPool";
 }  // namespace
 
-RsFragmentPool::RsFragmentPool(std::int32_t chunkFragments) : _chunkFragments(chunkFragments) {
+RsFragmentPool::RsFragmentPool(std::int32_t chunkFragments, std::size_t fragmentBytes)
+    : _chunkFragments(chunkFragments), _fragmentBytes(fragmentBytes) {
     ZR_ASSERT_AT(chunkFragments >= 0, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(fragmentBytes > 0, kSourceFile, __LINE__);
 }
 
 RsFragmentPool::~RsFragmentPool() = default;
@@ -47,7 +49,7 @@ void RsFragmentPool::enterChunk(std::size_t index) {
     const std::size_t bytes = begin == nullptr ? 0 : static_cast<std::size_t>(chunk._rectangle.getWidth());
     _current = begin;
     // Only whole fragments are handed out; a tail shorter than one stays unused.
-    _end = begin + bytes / sizeof(RsFragment) * sizeof(RsFragment);
+    _end = begin + bytes / _fragmentBytes * _fragmentBytes;
 }
 
 void RsFragmentPool::nextChunk() {

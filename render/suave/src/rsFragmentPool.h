@@ -5,6 +5,10 @@
 // A chunk is an image tile one row high, of one byte per pixel, so that fragment memory comes
 // from the same memory manager as pixels and is accounted with them. The pool holds a write guard
 // on each chunk, which keeps its memory alive and locked.
+//
+// One pool hands out records of one kind: RsFragment by default, or another fragment record (the
+// A-buffer's RsAFragment) whose size is given at construction and which allocate<Record>() then
+// hands out.
 #include <cstddef>
 #include <cstdint>
 #include <ostream>
@@ -18,18 +22,20 @@ namespace Zr {
 class RsFragmentPool {
 public:
     // A pool without chunks; its chunks will hold chunkFragments fragments each (at least one,
-    // so that a pool made for an empty region can still grow).
-    explicit RsFragmentPool(std::int32_t chunkFragments);
+    // so that a pool made for an empty region can still grow), each of fragmentBytes.
+    explicit RsFragmentPool(std::int32_t chunkFragments, std::size_t fragmentBytes = sizeof(RsFragment));
     ~RsFragmentPool();
     RsFragmentPool(const RsFragmentPool&) = delete;
     RsFragmentPool& operator=(const RsFragmentPool&) = delete;
 
     // An uninitialised fragment. Takes a new chunk of getChunkFragments() fragments when the
-    // current one is used up. Throws ExOutOfMemory when no chunk can be had.
-    RsFragment* allocate() {
+    // current one is used up. Throws ExOutOfMemory when no chunk can be had. Record must be of the
+    // size that the pool was made for.
+    template <class Record = RsFragment>
+    Record* allocate() {
         if (_current == _end) nextChunk();
-        RsFragment* fragment = reinterpret_cast<RsFragment*>(_current);
-        _current += sizeof(RsFragment);
+        Record* fragment = reinterpret_cast<Record*>(_current);
+        _current += sizeof(Record);
         return fragment;
     }
 
@@ -48,8 +54,9 @@ public:
     std::size_t getChunkCount() const { return _chunks.size(); }
     // Fragments that the current chunk can still hand out.
     std::size_t getFreeFragments() const {
-        return static_cast<std::size_t>(_end - _current) / sizeof(RsFragment);
+        return static_cast<std::size_t>(_end - _current) / _fragmentBytes;
     }
+    std::size_t getFragmentBytes() const { return _fragmentBytes; }
 
     // The chunk count times the bytes of the first chunk's row; 0 without chunks.
     std::size_t getMemorySize() const;
@@ -62,12 +69,13 @@ private:
     void nextChunk();
     void enterChunk(std::size_t index);
     std::size_t getGrowthBytes() const {
-        return static_cast<std::size_t>(_chunkFragments > 0 ? _chunkFragments : 1) * sizeof(RsFragment);
+        return static_cast<std::size_t>(_chunkFragments > 0 ? _chunkFragments : 1) * _fragmentBytes;
     }
 
     // One write guard per chunk, oldest first.
     std::vector<IxTileManip::WriteGuardNoCheck> _chunks;
     std::int32_t _chunkFragments;
+    std::size_t _fragmentBytes;  // the size of one record handed out
     // The next free byte of the current chunk, and the end of the fragments that fit in it.
     std::size_t _chunkIndex = 0;  // the chunk that _current and _end lie in
     unsigned char* _current = nullptr;

@@ -1,13 +1,8 @@
 #include "rsImageCreatorFZ.h"
 
-#include <bit>
-#include <cmath>
 #include <cstddef>
-#include <cstdint>
-#include <memory>
 #include <vector>
 
-#include "osMemoryArch.h"
 #include "rsDeepShadowMap.h"
 #include "rsFZBuffer.h"
 #include "rsImageCreatorUtil.h"
@@ -18,36 +13,7 @@ namespace Zr {
 namespace {
 
 using Rgba = RsImageCreatorFZ::Rgba;
-
-// Below this magnitude (1e-8, bits 0x322bcc77) an alpha is not divided by: the colour goes black.
-constexpr float kUnpremultiplyLimit = std::bit_cast<float>(std::uint32_t{0x322bcc77});
-
-int clampTo(int v, int lo, int hi) { return v < lo ? lo : (v > hi ? hi : v); }
-
-// A row of colours aligned to the memory architecture's alignment: one block of width colours
-// plus that alignment, the start rounded up to it. The block goes with the object.
-class AlignedRow {
-public:
-    explicit AlignedRow(int width) {
-        const OsMemoryArch* arch = OsMemoryArch::getInstance();
-        const std::size_t alignment =
-            static_cast<std::size_t>(arch != nullptr ? arch->getAlignment() : OsMemoryArch::DEFAULT_ALIGNMENT);
-        const std::size_t bytes = static_cast<std::size_t>(width) * sizeof(Rgba) + alignment;
-        _block = std::make_unique_for_overwrite<unsigned char[]>(bytes);
-        const std::uintptr_t start = reinterpret_cast<std::uintptr_t>(_block.get());
-        const std::uintptr_t aligned = (start + alignment - 1) & ~(std::uintptr_t(alignment) - 1);
-        _row = reinterpret_cast<Rgba*>(_block.get() + (aligned - start));
-    }
-    Rgba* get() const { return _row; }
-
-private:
-    std::unique_ptr<unsigned char[]> _block;
-    Rgba* _row = nullptr;
-};
-
-void fill(Rgba* begin, Rgba* end, const Rgba& colour) {
-    for (Rgba* p = begin; p < end; ++p) *p = colour;
-}
+using Util = RsImageCreatorUtil;
 
 // Lays each pixel's fragments over its start colour and finishes it. The transfer functions take
 // the colour by reference, which pins it to memory; the finishing works on a copy in registers, so
@@ -67,12 +33,7 @@ void compositeRow(Rgba* row, int width, RsFragment* const* lists, bool scale, fl
             pixel = Rgba(composite.r, composite.g, composite.b, composite.a);
         }
         if (scale) pixel *= weight;
-        if (unpremultiply) {
-            const float factor = std::fabs(pixel.a) <= kUnpremultiplyLimit ? 0.0f : 1.0f / pixel.a;
-            pixel.r *= factor;
-            pixel.g *= factor;
-            pixel.b *= factor;
-        }
+        if (unpremultiply) Util::unpremultiply(pixel);
         row[i] = pixel;
     }
 }
@@ -89,53 +50,30 @@ void RsImageCreatorFZ::createImage(RsFragment* const* lists, const GeRectangle<i
                                    bool accumulate, float weight, bool unpremultiply,
                                    const Rgba& fillColor, const IxReadGuard& background,
                                    const IxWriteGuard& output) {
-    const int x0 = region.x0, x1 = region.x1, y0 = region.y0, y1 = region.y1;
-    const int width = x1 - x0;
+    const int y0 = region.y0, y1 = region.y1;
+    const int width = region.x1 - region.x0;
 
-    // The part of the region that the background covers: columns left to right, rows top to
-    // bottom. Without a background no row falls inside.
-    int left = x0, right = x1, top = y0, bottom = y0;
-    if (background.holdsTile()) {
-        const GeRectangle<int>& b = background._rectangle;
-        left = clampTo(b.x0, x0, x1);
-        right = clampTo(b.x1, x0, x1);
-        top = clampTo(b.y0, y0, y1);
-        bottom = clampTo(b.y1, y0, y1);
-    }
-    const int leftPad = left - x0;
-    const int rightPad = x1 - right;
-
-    RsImageCreatorUtil::RowFunctions functions;
-    const IxPixelFormat& inFormat = background._pixelFormat;
-    const IxPixelFormat& outFormat = output._pixelFormat;
-    RsImageCreatorUtil::selectRowReader(functions, inFormat);
-    RsImageCreatorUtil::selectRowWriter(functions, outFormat, accumulate);
+    // The part of the region that the background covers; without a background no row falls inside.
+    const Util::BackgroundWindow window(background, region);
+    Util::RowFunctions functions;
+    Util::selectRowReader(functions, background._pixelFormat);
+    Util::selectRowWriter(functions, output._pixelFormat, accumulate);
     if (width <= 0) return;
 
     const bool scale = !RsTolerance::isEqual(weight, 1.0f);
-    const std::ptrdiff_t inPixelBytes = std::ptrdiff_t(inFormat._comps) * (inFormat._depth / 8);
-    const std::ptrdiff_t outPixelBytes = std::ptrdiff_t(outFormat._comps) * (outFormat._depth / 8);
-
-    AlignedRow rowBuffer(width);
+    Util::AlignedRow rowBuffer(width);
     Rgba* const row = rowBuffer.get();
     Rgba* const rowEnd = row + width;
     for (int y = y0; y < y1; ++y) {
-        if (y < top || y >= bottom) {
-            fill(row, rowEnd, fillColor);
+        if (!window.holdsRow(y)) {
+            Util::fill(row, rowEnd, fillColor);
         } else {
-            if (leftPad > 0) fill(row, row + leftPad, fillColor);
-            if (rightPad > 0) fill(rowEnd - rightPad, rowEnd, fillColor);
-            if (leftPad + rightPad < width) {
-                const unsigned char* pixels = background._basePointer +
-                                              std::ptrdiff_t(y) * background._rowStride +
-                                              std::ptrdiff_t(left) * inPixelBytes;
-                functions._reader(pixels, row + leftPad, width - leftPad - rightPad);
-            }
+            if (window.leftPad > 0) Util::fill(row, row + window.leftPad, fillColor);
+            if (window.rightPad > 0) Util::fill(rowEnd - window.rightPad, rowEnd, fillColor);
+            Util::readBackground(functions, background, window, y, row, width);
         }
         compositeRow(row, width, lists + std::ptrdiff_t(y - y0) * width, scale, weight, unpremultiply);
-        unsigned char* pixels = output._basePointer + std::ptrdiff_t(y) * output._rowStride +
-                                std::ptrdiff_t(x0) * outPixelBytes;
-        functions._writer(pixels, row, width);
+        Util::writeOutput(functions, output, region.x0, y, row, width);
     }
 }
 

@@ -3,6 +3,7 @@
 #include "assertions.h"
 #include "geFrustum.h"
 #include "rcStrongPtr.h"
+#include "rsABufferFactory.h"
 #include "rsCullAndSort.h"
 #include "rsFZBufferFactory.h"
 #include "rsSceneRenderer.h"
@@ -66,9 +67,17 @@ void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatr
                               const GeProjectiveMatrix3<double>& projection, bool accumulate, float weight,
                               const GeRectangle<int>& rectangle, const IxWriteGuard& output,
                               bool unpremultiply) {
-    if (_antialiasing)
-        Assertions::throwProgramAborted(kSourceFile, __LINE__,
-                                        "antialiased rendering is not available: the A-buffer path is missing");
+    if (_antialiasing) {
+        RsABufferFactory factory;
+        factory.setFilterKernel(_filterKernel);
+        factory.setZBuffer(_zBuffer);
+        factory.setOutput(output, accumulate, weight);
+        factory.setFillColor(_fillColor);
+        factory.setBackground(_background);
+        factory.setUnpremultiply(unpremultiply);
+        renderWithFactory(factory, scene, _zBuffer, worldToCamera, projection, rectangle);
+        return;
+    }
     RsFZBufferFactory factory;
     factory.setZBuffer(_zBuffer);
     factory.setOutput(output, accumulate, weight);

@@ -15,6 +15,9 @@ golden="$root/tools/zrender/golden"
 # The two other shadow map types (the pictures above have depth maps).
 "$build/tools/zrender" --size 160x120 --shadows midpoint -o "$golden/sample-160x120-midpoint.png"
 "$build/tools/zrender" --size 160x120 --shadows deep -o "$golden/sample-160x120-deep.png"
+# Antialiased, through a kernel of support 1 and one of support 2 (several regions each).
+"$build/tools/zrender" --size 160x120 --antialias --filter gaussian -o "$golden/sample-160x120-aa-gaussian.png"
+"$build/tools/zrender" --size 160x120 --antialias --filter cubic-bspline -o "$golden/sample-160x120-aa-cubic-bspline.png"
 # Real model files from the assimp-testmodels package: OBJ with textures, glTF 2.0 and PLY.
 models=/usr/share/assimp/models
 "$build/tools/zrender" "$models/OBJ/spider.obj" --size 160x120 -o "$golden/model-spider-obj.png"
