@@ -694,4 +694,28 @@ public:
     InterruptHandlerScope& operator=(const InterruptHandlerScope&) = delete;
 };
 
+// ---- Closed forms of what a pixel sees --------------------------------------------------------
+
+// The camera-space direction of the ray through the centre of pixel (x, y) of rectangle, for a
+// projection whose x and y rows are diagonal (such as perspective): ndc = (pixel - centre) / half.
+inline GeVector3<double> rayThroughPixel(const GeProjectiveMatrix3<double>& projection,
+                                         const GeRectangle<int>& rectangle, int x, int y) {
+    const double sx = (rectangle.x1 - rectangle.x0) * 0.5, sy = (rectangle.y1 - rectangle.y0) * 0.5;
+    const double nx = (x + 0.5 - rectangle.x0 - sx) / sx, ny = (y + 0.5 - rectangle.y0 - sy) / sy;
+    return {nx / projection(0, 0), ny / projection(1, 1), -1.0};
+}
+
+// Deep samples (nearest first, premultiplied) laid front to back with "over".
+inline Rgba flattenFrontToBack(const float* samples, std::size_t count, std::size_t stride) {
+    double r = 0, g = 0, b = 0, a = 0;
+    for (std::size_t i = 0; i < count; ++i) {
+        const float* s = samples + i * stride;
+        r += (1 - a) * s[0];
+        g += (1 - a) * s[1];
+        b += (1 - a) * s[2];
+        a += (1 - a) * s[3];
+    }
+    return Rgba(float(r), float(g), float(b), float(a));
+}
+
 }  // namespace Zr::RsTest

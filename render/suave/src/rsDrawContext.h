@@ -26,6 +26,9 @@ struct RsDrawContext {
     mutable RsShadingContext _shadingContext;
     // The material being drawn; not owned, the drawer holds it for the drawing.
     RsMaterialShader* _material = nullptr;
+    // The IDs of the instance and material being drawn, for renders with auxiliary outputs only.
+    float _objectId = 0.0f;
+    float _materialId = 0.0f;
 };
 
 }  // namespace Zr

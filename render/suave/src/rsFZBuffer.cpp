@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "assertions.h"
+#include "rsAuxOutputs.h"
 #include "rsImageCreatorFZ.h"
 #include "rsShadingInputs.h"
 #include "rsTolerance.h"
@@ -13,26 +14,34 @@ namespace {
 
 constexpr const char* kSourceFile = "render\\suave\\src\\rsFZBuffer";
 
-// The span method of a vertex kind for the buffer's mode.
+// The span method of a vertex kind for the buffer's mode, recording auxiliary outputs or not.
 template <class Vertex>
-typename RsFZBuffer::Rasterizer<Vertex>::DrawSpan spanMethod(bool zBuffer) {
+typename RsFZBuffer::Rasterizer<Vertex>::DrawSpan spanMethod(bool zBuffer, bool aux) {
+    if (aux) return zBuffer ? &RsFZBuffer::drawSpanZ<Vertex, true> : &RsFZBuffer::drawSpanNoZ<Vertex, true>;
     return zBuffer ? &RsFZBuffer::drawSpanZ<Vertex> : &RsFZBuffer::drawSpanNoZ<Vertex>;
 }
 
 }  // namespace
 
 RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply,
-                       RsFZBufferMemory* memory)
+                       RsFZBufferMemory* memory, RsAuxOutputs* aux)
     : _x(x),
       _y(y),
       _width(width),
       _height(height),
       _unpremultiply(unpremultiply),
+      _aux(aux != nullptr && (aux->hasSurface() || aux->hasDeep()) ? aux : nullptr),
       _memory(memory),
-      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer), getPixelRegion()),
-      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer), getPixelRegion()),
-      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer), getPixelRegion()) {
+      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer, _aux != nullptr && _aux->hasSurface()),
+                         getPixelRegion()),
+      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer, _aux != nullptr && _aux->hasSurface()),
+                       getPixelRegion()),
+      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer, _aux != nullptr && _aux->hasSurface()),
+                        getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
+    ZR_ASSERT_AT(_aux == nullptr || width == 0 || height == 0 ||
+                     (_aux->getRegion().contains(x, y) && _aux->getRegion().contains(x + width - 1, y + height - 1)),
+                 kSourceFile, __LINE__);
     const std::size_t pixels = getPixelCount();
     if (memory != nullptr && memory->_pool) {
         _pool = std::move(memory->_pool);
@@ -97,6 +106,7 @@ void RsFZBuffer::finalize() {
         RsImageCreatorFZ::createDeepShadowMap(*this, _x, _y, _width, _height, *_deepShadowMap);
         return;
     }
+    if (_aux != nullptr) _aux->finishRegion(*this);
     RsImageCreatorFZ::createImage(*this, getPixelRegion(), _accumulate, _weight, _unpremultiply, _fillColor,
                                   _background, _output);
 }
@@ -120,14 +130,18 @@ RsFragment* RsFZBuffer::makeFragment(const Context& context, const RsPixelData<V
     return fragment;
 }
 
-template <class Vertex>
+template <class Vertex, bool kAux>
 void RsFZBuffer::drawSpanNoZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data) {
     const std::ptrdiff_t rowStart = std::ptrdiff_t(row) * _width;
     unsigned char* const closed = _closed.get() + rowStart;
     RsFragment** const lists = _lists.get() + rowStart;
+    std::size_t auxRow = 0;
+    if constexpr (kAux) auxRow = _aux->indexOf(_x, _y + row);
     for (int x = span._x1; x < span._x2; ++x) {
         if (closed[x] == 0) {
             RsFragment* fragment = makeFragment(context, data);
+            if constexpr (kAux)
+                _aux->record(auxRow + std::size_t(x), fragment->_depth, fragment->_color.a, false, data, context);
             // The drawing order alone decides: the last drawn lies farthest.
             fragment->_next = lists[x];
             lists[x] = fragment;
@@ -138,16 +152,19 @@ void RsFZBuffer::drawSpanNoZ(const Context& context, int row, const Span& span, 
     }
 }
 
-template <class Vertex>
+template <class Vertex, bool kAux>
 void RsFZBuffer::drawSpanZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data) {
     const std::ptrdiff_t rowStart = std::ptrdiff_t(row) * _width;
     double* const nearest = _zBuffer.get() + rowStart;
     RsFragment** const lists = _lists.get() + rowStart;
+    std::size_t auxRow = 0;
+    if constexpr (kAux) auxRow = _aux->indexOf(_x, _y + row);
     for (int x = span._x1; x < span._x2; ++x) {
         // At or behind the nearest opaque surface nothing is shaded.
         if (nearest[x] > data._z._q) {
             RsFragment* fragment = makeFragment(context, data);
             const double depth = fragment->_depth;
+            if constexpr (kAux) _aux->record(auxRow + std::size_t(x), depth, fragment->_color.a, true, data, context);
             const bool opaque = context._canBeOpaque && RsTolerance::isOne(fragment->_color.a);
             RsFragment* const head = lists[x];
             if (head == nullptr || depth >= head->_depth) {
@@ -168,13 +185,16 @@ void RsFZBuffer::drawSpanZ(const Context& context, int row, const Span& span, Rs
     }
 }
 
-template void RsFZBuffer::drawSpanZ<RsPlainVertex>(const Context&, int, const Span&, RsPixelData<RsPlainVertex>&);
-template void RsFZBuffer::drawSpanZ<RsNormalVertex>(const Context&, int, const Span&, RsPixelData<RsNormalVertex>&);
-template void RsFZBuffer::drawSpanZ<RsTangentVertex>(const Context&, int, const Span&, RsPixelData<RsTangentVertex>&);
-template void RsFZBuffer::drawSpanNoZ<RsPlainVertex>(const Context&, int, const Span&, RsPixelData<RsPlainVertex>&);
-template void RsFZBuffer::drawSpanNoZ<RsNormalVertex>(const Context&, int, const Span&, RsPixelData<RsNormalVertex>&);
-template void RsFZBuffer::drawSpanNoZ<RsTangentVertex>(const Context&, int, const Span&,
-                                                        RsPixelData<RsTangentVertex>&);
+#define RS_FZ_SPANS(Vertex, aux)                                                                      \
+    template void RsFZBuffer::drawSpanZ<Vertex, aux>(const Context&, int, const Span&, RsPixelData<Vertex>&); \
+    template void RsFZBuffer::drawSpanNoZ<Vertex, aux>(const Context&, int, const Span&, RsPixelData<Vertex>&);
+RS_FZ_SPANS(RsPlainVertex, false)
+RS_FZ_SPANS(RsNormalVertex, false)
+RS_FZ_SPANS(RsTangentVertex, false)
+RS_FZ_SPANS(RsPlainVertex, true)
+RS_FZ_SPANS(RsNormalVertex, true)
+RS_FZ_SPANS(RsTangentVertex, true)
+#undef RS_FZ_SPANS
 
 void RsFZBuffer::dump(std::ostream& os) const {
     os << " _x: " << _x << " _y: " << _y << " _width: " << _width << " _height: " << _height

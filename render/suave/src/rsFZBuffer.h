@@ -38,6 +38,7 @@
 
 namespace Zr {
 
+class RsAuxOutputs;
 class RsDeepShadowMap;
 
 // What a fragment buffer allocates, handed on from one buffer to the next.
@@ -64,8 +65,10 @@ public:
     // zBuffer is set. unpremultiply is handed to the resolve. The fill colour starts as opaque
     // black, the guards empty. memory, when given, lends its arrays and pool and must outlive the
     // buffer.
+    // aux, when given, gathers the surface channels and deep samples of the buffer's pixels,
+    // which its region must hold; the buffer then draws with the span methods that record them.
     RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool unpremultiply,
-               RsFZBufferMemory* memory = nullptr);
+               RsFZBufferMemory* memory = nullptr, RsAuxOutputs* aux = nullptr);
     ~RsFZBuffer() override;
     RsFZBuffer(const RsFZBuffer&) = delete;
     RsFZBuffer& operator=(const RsFZBuffer&) = delete;
@@ -111,10 +114,11 @@ public:
 
     // The span methods, for the pixels [span._x1, span._x2) of region-relative row `row`, with the
     // pixel data placed at the first of them: with and without Z. Defined for the three vertex
-    // kinds of the rasterizers.
-    template <class Vertex>
+    // kinds of the rasterizers. With kAux the front-most fragments are also recorded in the
+    // auxiliary outputs.
+    template <class Vertex, bool kAux = false>
     void drawSpanZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data);
-    template <class Vertex>
+    template <class Vertex, bool kAux = false>
     void drawSpanNoZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data);
 
     // The list head of each pixel, row after row, getWidth() per row. For the resolve.
@@ -148,6 +152,7 @@ private:
     std::unique_ptr<RsFragment*[]> _lists;
     std::unique_ptr<RsFragmentPool> _pool;
     RsDeepShadowMap* _deepShadowMap = nullptr;
+    RsAuxOutputs* _aux;
     RsFZBufferMemory* _memory;
     std::size_t _arrayPixels = 0;  // the length of the per-pixel arrays, at least the pixel count
     Rasterizer<RsTangentVertex> _rasterizerTangent;

@@ -23,7 +23,7 @@ GeRectangle<int> RsFZBufferFactory::getDeepShadowMapRegion() const {
 
 RCShdPtr<RsFZBuffer> RsFZBufferFactory::createBuffer(const GeRectangle<int>& region) const {
     RCShdPtr<RsFZBuffer> buffer = makeShared<RsFZBuffer>(region.x0, region.y0, region.getWidth(),
-                                                         region.getHeight(), _zBuffer, _unpremultiply, _memory);
+                                                         region.getHeight(), _zBuffer, _unpremultiply, _memory, _aux);
     if (_deepShadowMap != nullptr) buffer->setOutput(*_deepShadowMap);
     else buffer->setOutput(_output, _background, _fillColor, _accumulate, _weight);
     return buffer;

@@ -49,6 +49,9 @@ public:
     // Where the buffers hand their arrays and pool on, from region to region: memory that outlives
     // the factory carries them from one render to the next as well. Null for the factory's own.
     void setMemory(RsFZBufferMemory* memory) { _memory = memory != nullptr ? memory : &_ownMemory; }
+    // Where the buffers gather surface channels and deep samples; null for none.
+    void setAuxOutputs(RsAuxOutputs* aux) { _aux = aux; }
+    RsAuxOutputs* getAuxOutputs() const { return _aux; }
 
     bool getZBuffer() const { return _zBuffer; }
     bool getUnpremultiply() const { return _unpremultiply; }
@@ -73,6 +76,7 @@ private:
     // Handed from each region's buffer to the next; the buffers die before the factory.
     RsFZBufferMemory _ownMemory;
     RsFZBufferMemory* _memory = &_ownMemory;
+    RsAuxOutputs* _aux = nullptr;
 };
 
 }  // namespace Zr

@@ -23,6 +23,7 @@
 #include "geRectangle.h"
 #include "geVector3.h"
 #include "rcShdPtr.h"
+#include "rsAuxOutputs.h"
 #include "rsGeomInstance.h"
 #include "rsInstanceVertices.h"
 #include "rsMaterialShader.h"
@@ -40,6 +41,7 @@ template <class Buffer>
 class RsRegionDrawer {
 public:
     using Context = typename Buffer::Context;
+    static constexpr bool kIds = std::is_same_v<Context, RsDrawContext>;
 
     // The near and far planes are clipped only for instances whose box crosses them; the four
     // sides of the region always, so that nothing is drawn outside the buffer.
@@ -71,7 +73,13 @@ public:
         _clipperTangent.setClipFlags(planes);
         _clipperDepth.setClipFlags(planes);
         _vertices = &vertices;
+        if constexpr (kIds)
+            if (_aux != nullptr) _context._objectId = _aux->getObjectIdOf(geom);
     }
+
+    // Renders with auxiliary outputs: every face group is drawn with normals, and the drawing
+    // context carries the IDs of instance and material.
+    void setAuxOutputs(const RsAuxOutputs* aux) { _aux = aux != nullptr && aux->hasSurface() ? aux : nullptr; }
 
     // Draws faces firstFace up to but not including endFace (both clamped to the mesh) with the
     // material, which is locked in memory meanwhile.
@@ -93,9 +101,13 @@ public:
         } unlock{shader};
 
         const unsigned int needed = shader.getNeededContext();
-        _context._needed = needed;
+        // The auxiliary outputs read the eye position and texture coordinates of every fragment.
+        _context._needed = _aux != nullptr ? needed | RsShadingContext::needsEyeCoord | RsShadingContext::needsTexCoord
+                                           : needed;
         const bool tangents = (needed & RsShadingContext::needsTangents) != 0;
-        const bool normals = (needed & RsShadingContext::needsNormal) != 0;
+        const bool normals = (needed & RsShadingContext::needsNormal) != 0 || _aux != nullptr;
+        if constexpr (kIds)
+            if (_aux != nullptr) _context._materialId = _aux->getMaterialIdOf(shader);
         if (tangents) _vertices->prepareTangents();
         if (shader.isWireframe()) {
             const bool screenSpace = shader.isScreenSpace();
@@ -287,6 +299,7 @@ private:
     // read; filled by drawFaces.
     Context _context;
     RCShdPtr<RsMaterialShader> _material;
+    const RsAuxOutputs* _aux = nullptr;
 };
 
 }  // namespace Zr

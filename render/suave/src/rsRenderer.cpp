@@ -4,6 +4,7 @@
 #include "geFrustum.h"
 #include "rcStrongPtr.h"
 #include "rsABufferFactory.h"
+#include "rsAuxOutputs.h"
 #include "rsCullAndSort.h"
 #include "rsFZBufferFactory.h"
 #include "rsSceneRenderer.h"
@@ -86,6 +87,10 @@ void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatr
     factory.setUnpremultiply(unpremultiply);
     if (!_bufferMemory) _bufferMemory = std::make_unique<RsFZBufferMemory>();
     factory.setMemory(_bufferMemory.get());
+    if (_auxOutputs != nullptr) {
+        _auxOutputs->begin(*scene, worldToCamera, projection);
+        factory.setAuxOutputs(_auxOutputs);
+    }
     renderWithFactory(factory, scene, _zBuffer, worldToCamera, projection, rectangle);
 }
 

@@ -26,6 +26,7 @@
 
 namespace Zr {
 
+class RsAuxOutputs;
 struct RsFZBufferMemory;
 
 class RsRenderer : public RCBase<LkCounter<int>>, public IxTileManip {
@@ -51,6 +52,10 @@ public:
     const CoRgbaColorTyped<float>& getFillColor() const { return _fillColor; }
     // An image that the scene is laid over; an empty guard for none.
     void setBackground(const IxReadGuard& background) { _background = ReadGuardNoCheck(background); }
+    // Surface channels and deep samples that renders without antialiasing gather beside the
+    // picture; not owned, null (the default) for none. Its region is to be the output's.
+    void setAuxOutputs(RsAuxOutputs* aux) { _auxOutputs = aux; }
+    RsAuxOutputs* getAuxOutputs() const { return _auxOutputs; }
 
     // Draws scene as seen through worldToCamera and projection (camera space to -1..1) into
     // output. rectangle is the picture that the projection's -1..1 spans, in pixels; the pixels
@@ -82,6 +87,7 @@ protected:
     ReadGuardNoCheck _background;
     // The fragment buffers' memory, kept from one render call to the next.
     std::unique_ptr<RsFZBufferMemory> _bufferMemory;
+    RsAuxOutputs* _auxOutputs = nullptr;
 };
 
 }  // namespace Zr

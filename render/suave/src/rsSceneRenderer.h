@@ -113,6 +113,8 @@ private:
         RCShdPtr<Buffer> buffer(_factory->createBuffer(region));  // depth factories hand out a plain pointer
         {
             RsRegionDrawer<Buffer> drawer(buffer, region, _orthographic);
+            if constexpr (requires { _factory->getAuxOutputs(); })
+                if (!_shadowPass) drawer.setAuxOutputs(_factory->getAuxOutputs());
             for (std::size_t i = 0; i < instances.size(); ++i) {
                 if constexpr (requires { requires Buffer::kDepthOnly; })
                     drawDepthInstance(drawer, *instances[i], vertices[i]);

@@ -1,0 +1,117 @@
+#include "rsAuxOutputs.h"
+
+#include <algorithm>
+#include <cmath>
+
+#include "rsFZBuffer.h"
+#include "rsGeomInstance.h"
+#include "rsMaterialShader.h"
+
+namespace Zr {
+
+RsAuxOutputs::RsAuxOutputs(const GeRectangle<int>& region, bool surface, bool deep)
+    : _region(region), _surface(surface), _deep(deep) {}
+
+float RsAuxOutputs::getObjectIdOf(const RsGeomInstance& instance) const {
+    const auto it = _objectIds.find(&instance);
+    return it == _objectIds.end() ? 0.0f : it->second;
+}
+
+float RsAuxOutputs::getMaterialIdOf(const RsMaterialShader& material) const {
+    const auto it = _materialIds.find(material.getMaterial().get());
+    return it == _materialIds.end() ? 0.0f : it->second;
+}
+
+void RsAuxOutputs::begin(const RsScene& scene, const GeAffineMatrix3<float>& worldToCamera,
+                         const GeProjectiveMatrix3<double>& projection) {
+    const std::size_t pixels = std::size_t(std::max(0, _region.x1 - _region.x0)) *
+                               std::size_t(std::max(0, _region.y1 - _region.y0));
+    // The threshold of 1 means the opaque test's tolerance: an alpha a hair below 1 counts.
+    _minAlpha = _threshold * (1.0f - 1.1920929e-7f);
+    _nearest.assign(_surface ? pixels : 0, kNone);
+    for (std::vector<float>* channel : {&_z, &_objectId, &_materialId}) channel->assign(_surface ? pixels : 0, 0.0f);
+    _normal.assign(_surface ? 3 * pixels : 0, 0.0f);
+    _position.assign(_surface ? 3 * pixels : 0, 0.0f);
+    _texCoord.assign(_surface ? 2 * pixels : 0, 0.0f);
+    _deepOffsets.assign(_deep ? pixels : 0, 0);
+    _deepCounts.assign(_deep ? pixels : 0, 0);
+    _deepSamples.clear();
+
+    _worldToCamera = worldToCamera;
+    _cameraToWorld = worldToCamera.computeInverse();
+    _a = projection(2, 2);
+    _b = projection(2, 3);
+    _c = projection(3, 2);
+    _e = projection(3, 3);
+
+    _objectIds.clear();
+    _materialIds.clear();
+    float object = 0.0f;
+    for (const RCShdPtr<RsGeomInstance>& instance : scene._geomInstances) {
+        const RsGeomInstance& geom = *instance;
+        _objectIds.emplace(&geom, object += 1.0f);
+        for (const RCShdPtr<RsMaterialShader>& material : geom._materials) {
+            const SdMaterial* key = material->getMaterial().get();
+            _materialIds.emplace(key, static_cast<float>(_materialIds.size() + 1));
+        }
+    }
+}
+
+float RsAuxOutputs::eyeDepthOf(double pixelDepth) const {
+    // Undo the viewport (0..1 from -1..1) and the projection's z and w rows.
+    const double d = 2.0 * pixelDepth - 1.0;
+    const double z = (_b - d * _e) / (d * _c - _a);
+    return static_cast<float>(-z);
+}
+
+void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
+    const int width = buffer.getWidth(), height = buffer.getHeight();
+    if (_surface) {
+        for (int row = 0; row < height; ++row) {
+            const std::size_t first = indexOf(buffer.getX(), buffer.getY() + row);
+            for (std::size_t i = first; i < first + std::size_t(width); ++i) {
+                if (_nearest[i] == kNone) continue;
+                float* p = &_position[3 * i];
+                float* n = &_normal[3 * i];
+                _z[i] = -p[2];
+                const GePoint3<float> world = _cameraToWorld.transformPoint(GePoint3<float>(p[0], p[1], p[2]));
+                p[0] = world.x;
+                p[1] = world.y;
+                p[2] = world.z;
+                // Normals go back through the transpose of the world-to-camera map.
+                const GeVector3<float> m = _worldToCamera.mulOnRight(GeVector3<float>(n[0], n[1], n[2]));
+                const float length = std::sqrt(m.x * m.x + m.y * m.y + m.z * m.z);
+                const float scale = length > 0.0f ? 1.0f / length : 0.0f;
+                n[0] = m.x * scale;
+                n[1] = m.y * scale;
+                n[2] = m.z * scale;
+            }
+        }
+    }
+    if (_deep) {
+        RsFragment* const* lists = buffer.getLists();
+        std::vector<const RsFragment*> nearFirst;
+        for (int row = 0; row < height; ++row) {
+            const std::size_t first = indexOf(buffer.getX(), buffer.getY() + row);
+            for (int x = 0; x < width; ++x) {
+                nearFirst.clear();
+                for (const RsFragment* f = lists[std::size_t(row) * std::size_t(width) + std::size_t(x)]; f != nullptr;
+                     f = f->_next)
+                    nearFirst.push_back(f);
+                const std::size_t i = first + std::size_t(x);
+                _deepOffsets[i] = static_cast<std::uint32_t>(_deepSamples.size());
+                _deepCounts[i] = static_cast<std::uint32_t>(nearFirst.size());
+                for (auto f = nearFirst.rbegin(); f != nearFirst.rend(); ++f) {
+                    // What the fragment lays over nothing is its share of the pixel.
+                    const RsFragment& fragment = **f;
+                    CoRgbaColorTyped<float> alone(0.0f, 0.0f, 0.0f, 1.0f);
+                    fragment._transfer(fragment._color, CoRgbaColorTyped<float>(0.0f, 0.0f, 0.0f, 0.0f), alone);
+                    const float z = eyeDepthOf(fragment._depth);
+                    _deepSamples.push_back({z, z, alone.r, alone.g, alone.b, alone.a});
+                }
+            }
+        }
+    }
+}
+
+}  // namespace Zr
