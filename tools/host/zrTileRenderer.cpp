@@ -11,6 +11,7 @@
 #include "ixTile.h"
 #include "ixWriteGuard.h"
 #include "rsRenderer.h"
+#include "zrPassImages.h"
 #include "zrRenderProgress.h"
 
 namespace Zr {
@@ -79,11 +80,15 @@ OIIO::ImageBuf ZrTileRenderer::render(const SceneMaker& makeScene, const RCShdPt
                 const int y0 = (t / columns) * tileSize;
                 const GeRectangle<int> region{x0, std::min(width, x0 + tileSize), y0, std::min(height, y0 + tileSize)};
                 IxTile tile(format, region, {0.0f, 0.0f, 0.0f, 0.0f});
+                std::unique_ptr<RsAuxOutputs> passes;
+                if (settings.passes) passes = settings.passes->makeTileOutputs(region);
+                renderer->setAuxOutputs(passes.get());
                 renderer->render(camera, scene, rectangle, IxWriteGuard(tile));
                 {
                     const std::lock_guard<std::mutex> hold(lock);
                     copyTile(tile, height, settings.floatPixels, picture);
                 }
+                if (settings.passes) settings.passes->keepTile(std::move(passes));
                 if (progress) progress->tileDone();
             }
         } catch (...) {

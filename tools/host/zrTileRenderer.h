@@ -21,6 +21,7 @@
 
 namespace Zr {
 
+class ZrPassImages;
 class ZrRenderProgress;
 
 struct ZrRenderSettings {
@@ -33,6 +34,8 @@ struct ZrRenderSettings {
     bool floatPixels = false;
     int threads = 1;
     int tileSize = 128;
+    // Gathers the compositing passes of every tile when given; not owned.
+    ZrPassImages* passes = nullptr;
 };
 
 class ZrTileRenderer {

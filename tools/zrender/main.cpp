@@ -20,6 +20,7 @@
 #include "zrInfoReport.h"
 #include "zrModelFile.h"
 #include "zrOptions.h"
+#include "zrPassImages.h"
 #include "zrRenderProgress.h"
 #include "zrSampleScene.h"
 #include "zrTileRenderer.h"
@@ -59,6 +60,11 @@ int run(const ZrOptions& options) {
     settings.floatPixels = storage != ZrImageFile::Storage::uint8;
     settings.threads = options.threads;
     settings.tileSize = options.tileSize;
+    // Compositing passes: float pictures, layered into the output.
+    const unsigned passList = ZrPassImages::parse(options.passes);
+    if (passList != 0 && storage == ZrImageFile::Storage::uint8)
+        throw ZrHostError(options.output + ": --passes needs an OpenEXR picture");
+    if (passList != 0 || !options.deep.empty()) settings.floatPixels = true;
 
     RCShdPtr<ZrRenderProgress> progress = makeShared<ZrRenderProgress>(isatty(STDERR_FILENO) == 1);
     const InstalledHandler installed(progress);
@@ -77,14 +83,18 @@ int run(const ZrOptions& options) {
         };
         progress->startFrame(frame - options.firstFrame + 1, options.frameCount(),
                              ZrTileRenderer::tileCount(options.width, options.height, options.tileSize));
+        ZrPassImages passes(passList, !options.deep.empty(), options.width, options.height);
+        settings.passes = &passes;
         const OIIO::ImageBuf picture =
             ZrTileRenderer::render(makeScene, camera, options.width, options.height, settings, progress.get());
         progress->finish();
         // Ctrl-C after the last scanline still cancels: nothing is written.
         if (ZrRenderProgress::interrupted()) throw ExRenderCancelled();
 
-        if (options.compare.empty() || options.outputGiven)
+        if (passList != 0) ZrPassImages::writeExr(options.outputOfFrame(frame), passes.layers(picture));
+        else if (options.compare.empty() || options.outputGiven)
             ZrImageFile::write(options.outputOfFrame(frame), picture, storage);
+        if (!options.deep.empty()) ZrPassImages::writeExr(options.deep, passes.deepImage());
         if (!options.compare.empty()) {
             const ZrImageFile::Difference difference =
                 ZrImageFile::compare(picture, reference, options.tolerance);

@@ -134,6 +134,12 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
     app.add_option("--shadow-map-size", o.shadows.mapSize, "side of each shadow map in texels (default 1024)")
         ->type_name("N")
         ->check(CLI::Range(16, 16384));
+    // Compositing passes.
+    app.add_option("--passes", o.passes, "also write the passes LIST (of z, n, p, uv, id) as layers of the "
+                                         "picture, which must be an OpenEXR file")
+        ->type_name("LIST");
+    app.add_option("--deep", o.deep, "also write every fragment of every pixel to the deep OpenEXR FILE")
+        ->type_name("FILE");
     app.add_flag("--info", o.info, "print the library's package records and build record, and exit");
 
     try {

@@ -32,6 +32,9 @@ struct ZrOptions {
     // Straight colour of the pixels that no surface covers: a dark blue-grey, opaque.
     CoRgbaColorTyped<float> fill{0.16f, 0.18f, 0.23f, 1.0f};
     bool info = false;
+    // Compositing passes: the names of --passes beside the picture, and the file of --deep.
+    std::string passes;
+    std::string deep;
     ZrShadowOptions shadows;
 
     // Reads the arguments. Returns -1 when zrender is to go on, otherwise the exit status: 0 after

@@ -1,0 +1,140 @@
+#include "zrPassImages.h"
+
+#include <sstream>
+
+#include <OpenImageIO/deepdata.h>
+#include <OpenImageIO/imagebufalgo.h>
+
+#include "zrHostError.h"
+
+namespace Zr {
+
+namespace {
+
+// The channels of each pass, in file order, with how many floats per pixel the outputs hold.
+struct PassChannels {
+    unsigned pass;
+    std::vector<std::string> names;
+    const std::vector<float>& (RsAuxOutputs::*values)() const;
+};
+
+const std::vector<PassChannels>& passChannels() {
+    static const std::vector<PassChannels> channels{
+        {ZrPassImages::depth, {"Z"}, &RsAuxOutputs::getZ},
+        {ZrPassImages::normal, {"N.X", "N.Y", "N.Z"}, &RsAuxOutputs::getNormal},
+        {ZrPassImages::position, {"P.X", "P.Y", "P.Z"}, &RsAuxOutputs::getPosition},
+        {ZrPassImages::texCoord, {"UV.U", "UV.V"}, &RsAuxOutputs::getTexCoord},
+        {ZrPassImages::ids, {"ObjectID"}, &RsAuxOutputs::getObjectId},
+        {ZrPassImages::ids, {"MaterialID"}, &RsAuxOutputs::getMaterialId},
+    };
+    return channels;
+}
+
+}  // namespace
+
+unsigned ZrPassImages::parse(const std::string& list) {
+    unsigned passes = 0;
+    std::istringstream in(list);
+    for (std::string name; std::getline(in, name, ',');) {
+        if (name == "z") passes |= depth;
+        else if (name == "n") passes |= normal;
+        else if (name == "p") passes |= position;
+        else if (name == "uv") passes |= texCoord;
+        else if (name == "id") passes |= ids;
+        else throw ZrHostError("--passes: no pass named '" + name + "' (z, n, p, uv, id)");
+    }
+    return passes;
+}
+
+ZrPassImages::ZrPassImages(unsigned passes, bool deep, int width, int height)
+    : _passes(passes), _deep(deep), _width(width), _height(height) {}
+
+std::unique_ptr<RsAuxOutputs> ZrPassImages::makeTileOutputs(const GeRectangle<int>& tile) const {
+    if (_passes == 0 && !_deep) return nullptr;
+    return std::make_unique<RsAuxOutputs>(tile, _passes != 0, _deep);
+}
+
+void ZrPassImages::keepTile(std::unique_ptr<RsAuxOutputs> outputs) {
+    const std::lock_guard<std::mutex> hold(_lock);
+    if (outputs) _tiles.push_back(std::move(outputs));
+}
+
+OIIO::ImageBuf ZrPassImages::layers(const OIIO::ImageBuf& picture) const {
+    std::vector<std::string> names{"R", "G", "B", "A"};
+    std::vector<const PassChannels*> wanted;
+    for (const PassChannels& p : passChannels())
+        if ((_passes & p.pass) != 0) {
+            wanted.push_back(&p);
+            names.insert(names.end(), p.names.begin(), p.names.end());
+        }
+    const int channels = static_cast<int>(names.size());
+    OIIO::ImageSpec spec(_width, _height, channels, OIIO::TypeDesc::FLOAT);
+    spec.channelnames = names;
+    spec.alpha_channel = 3;
+    spec.z_channel = (_passes & depth) != 0 ? 4 : -1;
+    OIIO::ImageBuf image(spec);
+    OIIO::ImageBufAlgo::paste(image, 0, 0, 0, 0, picture);
+    std::vector<float> row;
+    for (const std::unique_ptr<RsAuxOutputs>& tile : _tiles) {
+        const GeRectangle<int>& r = tile->getRegion();
+        int first = 4;
+        for (const PassChannels* p : wanted) {
+            const int count = static_cast<int>(p->names.size());
+            const std::vector<float>& values = ((*tile).*(p->values))();
+            for (int y = r.y0; y < r.y1; ++y) {
+                // The renderer's rows count upwards, the image's down.
+                const OIIO::ROI roi(r.x0, r.x1, _height - 1 - y, _height - y, 0, 1, first, first + count);
+                image.set_pixels(roi, OIIO::TypeDesc::FLOAT, &values[tile->indexOf(r.x0, y) * count]);
+            }
+            first += count;
+        }
+    }
+    return image;
+}
+
+OIIO::ImageBuf ZrPassImages::deepImage() const {
+    OIIO::ImageSpec spec(_width, _height, 6, OIIO::TypeDesc::FLOAT);
+    spec.channelnames = {"R", "G", "B", "A", "Z", "ZBack"};
+    spec.alpha_channel = 3;
+    spec.z_channel = 4;
+    spec.deep = true;
+    OIIO::ImageBuf image(spec);
+    OIIO::DeepData& deep = *image.deepdata();
+    const auto pixelOf = [this](int x, int y) { return std::int64_t(_height - 1 - y) * _width + x; };
+    std::vector<unsigned int> counts(std::size_t(_width) * std::size_t(_height), 0);
+    for (const std::unique_ptr<RsAuxOutputs>& tile : _tiles) {
+        const GeRectangle<int>& r = tile->getRegion();
+        for (int y = r.y0; y < r.y1; ++y)
+            for (int x = r.x0; x < r.x1; ++x) counts[pixelOf(x, y)] = tile->getDeepCounts()[tile->indexOf(x, y)];
+    }
+    deep.set_all_samples(counts);
+    for (const std::unique_ptr<RsAuxOutputs>& tile : _tiles) {
+        const GeRectangle<int>& r = tile->getRegion();
+        for (int y = r.y0; y < r.y1; ++y)
+            for (int x = r.x0; x < r.x1; ++x) {
+                const std::size_t i = tile->indexOf(x, y);
+                const RsDeepSample* s = &tile->getDeepSamples()[tile->getDeepOffsets()[i]];
+                const std::int64_t pixel = pixelOf(x, y);
+                for (int k = 0; k < static_cast<int>(tile->getDeepCounts()[i]); ++k) {
+                    const float values[6] = {s[k]._r, s[k]._g, s[k]._b, s[k]._a, s[k]._zFront, s[k]._zBack};
+                    for (int c = 0; c < 6; ++c) deep.set_deep_value(pixel, c, k, values[c]);
+                }
+            }
+    }
+    return image;
+}
+
+void ZrPassImages::writeExr(const std::string& path, const OIIO::ImageBuf& image) {
+    OIIO::ImageBuf out(image.spec());
+    out.copy(image);
+    out.specmod().attribute("Software", "zrender");
+    out.set_write_format(OIIO::TypeDesc::FLOAT);
+    if (!out.write(path, OIIO::TypeDesc::FLOAT, "openexr")) {
+        std::string reason = out.geterror();
+        for (char& c : reason)
+            if (c == '\n') c = ' ';
+        throw ZrHostError(path + ": " + reason);
+    }
+}
+
+}  // namespace Zr
