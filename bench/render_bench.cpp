@@ -17,6 +17,7 @@
 
 #include "ixTile.h"
 #include "ixWriteGuard.h"
+#include "rsAuxOutputs.h"
 #include "rsRenderer.h"
 #include "zrBenchScenes.h"
 #include "zrDiffuseShader.h"
@@ -50,7 +51,7 @@ ZrSceneKit::ShaderMaker countingShaders(std::uint64_t& count) {
 // Renders scene through camera at the size of the benchmark's first two arguments, once per
 // iteration; antialiased with the given kernel unless it is negative.
 void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const RCShdPtr<SdInstance>& camera,
-                const std::uint64_t& fragments, int antialiasKernel = -1) {
+                const std::uint64_t& fragments, int antialiasKernel = -1, RsAuxOutputs* aux = nullptr) {
     const int width = static_cast<int>(state.range(0));
     const int height = static_cast<int>(state.range(1));
     const GeRectangle<int> rectangle{0, width, 0, height};
@@ -62,6 +63,8 @@ void renderLoop(benchmark::State& state, const RCShdPtr<RsScene>& scene, const R
         renderer->setAntialiasing(true);
         renderer->setFilterKernel(static_cast<RsFilterKernel::KernelType>(antialiasKernel));
     }
+
+    renderer->setAuxOutputs(aux);
 
     const std::uint64_t fragmentsBefore = fragments;
     for (auto _ : state) renderer->render(camera, scene, rectangle, output);
@@ -87,6 +90,22 @@ void sampleScene(benchmark::State& state, int antialiasKernel) {
 }
 void BM_SampleScene(benchmark::State& state) { sampleScene(state, -1); }
 BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
+
+// The sample scene with compositing passes: third argument 0 for none, 1 for the surface channels
+// (Z, N, P, UV, IDs), 2 for deep samples, 3 for both.
+void BM_SampleScenePasses(benchmark::State& state) {
+    std::uint64_t fragments = 0;
+    const RCShdPtr<RsScene> scene = ZrSampleScene::makeUnlitScene(countingShaders(fragments));
+    const GeRectangle<int> rectangle{0, static_cast<int>(state.range(0)), 0, static_cast<int>(state.range(1))};
+    RsAuxOutputs aux(rectangle, (state.range(2) & 1) != 0, (state.range(2) & 2) != 0);
+    renderLoop(state, scene, sampleCamera(state), fragments, -1, state.range(2) != 0 ? &aux : nullptr);
+}
+BENCHMARK(BM_SampleScenePasses)
+    ->Args({1920, 1080, 0})
+    ->Args({1920, 1080, 1})
+    ->Args({1920, 1080, 2})
+    ->Args({1920, 1080, 3})
+    ->Unit(benchmark::kMillisecond);
 
 // The sample scene as zrender draws it: three lights and the standard material. Its fragments
 // are those of the unlit scene (the same surfaces, the same opacities), counted in one render of
