@@ -133,7 +133,8 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
         for (float z : depths) {
             const int x0 = int(rng() % w), x1 = x0 + 1 + int(rng() % (w - x0));
             const int y0 = int(rng() % h), y1 = y0 + 1 + int(rng() % (h - y0));
-            const float alpha = rng() % 3 == 0 ? 1.0f : 0.1f + 0.8f * unit(rng);
+            // Opaque layers of alpha 1 and of alpha one ulp below, which counts as one.
+            const float alpha = rng() % 3 == 0 ? (rng() % 2 ? 1.0f : 0.99999994f) : 0.1f + 0.8f * unit(rng);
             layers.push_back({{x0, x1, y0, y1}, -z, Rgba(unit(rng), unit(rng), unit(rng), alpha),
                               float(layers.size() + 1)});
             const float l = float(x0 - w / 2), r = float(x1 - w / 2), b = float(y0 - h / 2), t = float(y1 - h / 2);
@@ -165,8 +166,9 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
                 for (const Layer& l : layers) {
                     if (!l.pixels.contains(x, y)) continue;
                     visible.push_back(&l);
-                    if (front == nullptr && l.colour.a >= threshold) front = &l;
-                    if (l.colour.a == 1.0f) break;
+                    const bool opaque = l.colour.a >= 0.99999994f;
+                    if (front == nullptr && (opaque || l.colour.a >= threshold)) front = &l;
+                    if (opaque) break;
                 }
                 EXPECT_EQ(aux.getObjectId()[i], front ? front->id : 0.0f) << where;
                 EXPECT_NEAR(aux.getZ()[i], front ? front->z : 0.0f, 1e-5f) << where;

@@ -1,7 +1,7 @@
 // The compositing passes of the sample scene (all in the normal mode) rendered as tiles on several threads and read back
 // from their OpenEXR files: the layers carry the conventional channel names and the picture
-// unchanged, both files are the same on any number of threads, and every deep pixel laid front to
-// back gives the picture's pixel.
+// unchanged, both files are the same on any number of threads, every deep pixel laid front to
+// back gives the picture's pixel, and Z is the depth of its opaque sample.
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -106,6 +106,12 @@ TEST(ZrPassImages, FilesHoldThePassesAndTheDeepPixelsFlattenToThePicture) {
             last = deepOne.deep_value(p, z, s);
         }
         if (deepOne.samples(p) > 1) ++layeredPixels;
+        // Z is the depth of the front-most opaque fragment, which is the pixel's last sample.
+        const int n = int(deepOne.samples(p));
+        const bool opaque = n > 0 && deepOne.deep_value(p, one.deep.spec().channelindex("A"), n - 1) >= 0.9999999f;
+        EXPECT_NEAR(layered[std::size_t(p) * channels + one.layers.spec().channelindex("Z")], opaque ? last : 0.0f,
+                    1e-5f * last)
+            << "pixel " << p;
         for (int c = 0; c < 4; ++c)
             EXPECT_NEAR(flat[c], layered[std::size_t(p) * channels + rgba[c]], 2e-6) << "pixel " << p << " channel " << c;
     }
