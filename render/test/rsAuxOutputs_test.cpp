@@ -173,7 +173,7 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
                 EXPECT_EQ(aux.getObjectId()[i], front ? front->id : 0.0f) << where;
                 EXPECT_NEAR(aux.getZ()[i], front ? front->z : 0.0f, 1e-5f) << where;
                 ASSERT_EQ(aux.getDeepCounts()[i], visible.size()) << where;
-                const RsDeepSample* samples = &aux.getDeepSamples()[aux.getDeepOffsets()[i]];
+                const RsDeepSample* samples = aux.getDeepSamples().data() + aux.getDeepOffsets()[i];
                 for (std::size_t s = 0; s < visible.size(); ++s) {
                     EXPECT_NEAR(samples[s]._zFront, visible[s]->z, 1e-4) << where;
                     EXPECT_EQ(samples[s]._zBack, samples[s]._zFront) << where;

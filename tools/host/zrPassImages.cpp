@@ -113,7 +113,7 @@ OIIO::ImageBuf ZrPassImages::deepImage() const {
         for (int y = r.y0; y < r.y1; ++y)
             for (int x = r.x0; x < r.x1; ++x) {
                 const std::size_t i = tile->indexOf(x, y);
-                const RsDeepSample* s = &tile->getDeepSamples()[tile->getDeepOffsets()[i]];
+                const RsDeepSample* s = tile->getDeepSamples().data() + tile->getDeepOffsets()[i];
                 const std::int64_t pixel = pixelOf(x, y);
                 for (int k = 0; k < static_cast<int>(tile->getDeepCounts()[i]); ++k) {
                     const float values[6] = {s[k]._r, s[k]._g, s[k]._b, s[k]._a, s[k]._zFront, s[k]._zBack};
