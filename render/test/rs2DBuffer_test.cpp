@@ -26,7 +26,8 @@ std::array<Pt, 3> exactTriangle(std::mt19937& rng, const GeRectangle<int>& r) {
     const int kind = std::uniform_int_distribution<int>(0, 2)(rng);  // general, flat top, flat bottom
     i64 d = quarter << std::uniform_int_distribution<int>(0, 6)(rng);
     while ((kind == 0 ? 2 * d : d) >= height) d /= 2;
-    const i64 top = r.y0 * u + quarter * std::uniform_int_distribution<i64>(0, (height - (kind == 0 ? 2 * d : d)) / quarter - 1)(rng);
+    const i64 room = (height - (kind == 0 ? 2 * d : d)) / quarter;
+    const i64 top = r.y0 * u + quarter * std::uniform_int_distribution<i64>(0, room - 1)(rng);
     const std::array<i64, 3> ys = kind == 0 ? std::array<i64, 3>{top, top + d, top + 2 * d}
                                   : kind == 1 ? std::array<i64, 3>{top, top, top + d}
                                               : std::array<i64, 3>{top, top + d, top + d};
@@ -87,7 +88,8 @@ TEST(Rs2DBuffer, ClippedTrianglesCoverWhatTheUnclippedOnesCoverInTheTile) {
     Rs2DBuffer buffer(tile, {1.0f, 1.0f, 1.0f, 0.5f}, true);
     for (int drawn = 0; drawn < 40;) {
         std::array<Pt, 3> p;
-        for (Pt& q : p) q = {randomCoord(rng, rect.x0 - 30, rect.x1 + 30), randomCoord(rng, rect.y0 - 30, rect.y1 + 30)};
+        for (Pt& q : p)
+            q = {randomCoord(rng, rect.x0 - 30, rect.x1 + 30), randomCoord(rng, rect.y0 - 30, rect.y1 + 30)};
         const ReferenceTriangle ref(p[0], p[1], p[2], rect.x0, rect.y0, 0, 0);
         // Keep triangles whose coverage changes along each of the four border lines of pixels.
         const int w = rect.getWidth(), h = rect.getHeight();

@@ -184,7 +184,8 @@ TEST(RsAccumulationRenderer, SampleTimesWeightsAndPassCounts) {
 // float RGBA output keeps the premultiplied sum and an 8-bit output is not written at all.
 TEST(RsAccumulationRenderer, OnePassOfSeveralSamplesLeavesTheFrameUnfinished) {
     const GeRectangle<int> rect{0, 8, 0, 8};
-    const RCShdPtr<RsScene> scene = makeScene({drawn(quad(-9, 9, -9, 9, -5), MaterialSettings({1.0f, 0.5f, 0.0f, 0.5f}))});
+    const RCShdPtr<RsScene> scene =
+        makeScene({drawn(quad(-9, 9, -9, 9, -5), MaterialSettings({1.0f, 0.5f, 0.0f, 0.5f}))});
     const RCShdPtr<SdInstance> camera = cameraAtOrigin(SdCamera::Projection::perspective, 1.0f);
     RsAccumulationRenderer r;
     const IxWriteGuard floats = makeTile({4, 32}, rect), bytes = makeTile({4, 8}, rect, {0.1f, 0.2f, 0.3f, 0.4f});

@@ -562,7 +562,8 @@ inline std::uint32_t filledChannel(int depth, bool blending, const Rgba& colour,
     const float source = rgbaIndex == 3 ? alpha : channelOf(colour, rgbaIndex) * alpha;
     const float keep = 1.0f - alpha;
     if (depth == 8) return std::uint32_t(std::clamp(int(source * 255.0f + float(old) * keep), 0, 255));
-    if (depth == 16) return IxPixelConvert::floatToHalf(source + IxPixelConvert::halfToFloat(std::uint16_t(old)) * keep);
+    if (depth == 16)
+        return IxPixelConvert::floatToHalf(source + IxPixelConvert::halfToFloat(std::uint16_t(old)) * keep);
     return std::bit_cast<std::uint32_t>(source + std::bit_cast<float>(old) * keep);
 }
 
@@ -629,7 +630,8 @@ public:
         for (int y = _r.y0; y < _r.y1; ++y)
             for (int x = _r.x0; x < _r.x1; ++x)
                 for (int c = 0; c < _comps; ++c, ++i)
-                    ASSERT_EQ(rawChannel(_g, x, y, c), _bits[i]) << where << " pixel " << x << ", " << y << " channel " << c;
+                    ASSERT_EQ(rawChannel(_g, x, y, c), _bits[i])
+                        << where << " pixel " << x << ", " << y << " channel " << c;
     }
 
 private:

@@ -53,7 +53,8 @@ template <class R>
 void Rs2DBuffer::drawFan(const R& rasterizer, const Rs2DVertex& a, const Rs2DVertex& b, const Rs2DVertex& c) {
     const int count = clipTriangle(a, b, c);
     const Context context;
-    for (int i = 1; i + 1 < count; ++i) rasterizer.rasterizeTriangle(context, *_polygon[0], *_polygon[i], *_polygon[i + 1]);
+    for (int i = 1; i + 1 < count; ++i)
+        rasterizer.rasterizeTriangle(context, *_polygon[0], *_polygon[i], *_polygon[i + 1]);
 }
 
 int Rs2DBuffer::clipTriangle(const Rs2DVertex& a, const Rs2DVertex& b, const Rs2DVertex& c) {

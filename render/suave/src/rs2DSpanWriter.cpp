@@ -86,24 +86,37 @@ struct Writer {
         }
     }
 
+    // What a whole pixel of the colour takes: the stored channels, or the blend's source and the
+    // weight of what lies below. Made once per span.
+    struct Solid {
+        explicit Solid(const Rgba& colour) {
+            float v[C];
+            if constexpr (Blending) {
+                sources(colour, colour.a, _source);
+                _inv = 1.0f - colour.a;
+            } else {
+                channels(colour, colour.a, v);
+                for (int c = 0; c < C; ++c) _stored[c] = Channel::store(v[c]);
+            }
+        }
+        void write(T* p) const {
+            if constexpr (Blending) {
+                for (int c = 0; c < C; ++c) p[c] = Channel::over(_source[c], _inv, p[c]);
+            } else {
+                for (int c = 0; c < C; ++c) p[c] = _stored[c];
+            }
+        }
+        T _stored[C];
+        float _source[C];
+        float _inv;
+    };
+
     static void fill(const IxWriteGuard& guard, int y, int x1, int x2, const Rgba& colour) {
         if (x1 >= x2) return;
+        const Solid solid(colour);
         T* p = pixelAt(guard, x1, y);
         T* const end = p + static_cast<std::ptrdiff_t>(x2 - x1) * C;
-        float v[C];
-        if constexpr (Blending) {
-            // Source and weight are the same for the whole run.
-            sources(colour, colour.a, v);
-            const float inv = 1.0f - colour.a;
-            for (; p < end; p += C)
-                for (int c = 0; c < C; ++c) p[c] = Channel::over(v[c], inv, p[c]);
-        } else {
-            channels(colour, colour.a, v);
-            T stored[C];
-            for (int c = 0; c < C; ++c) stored[c] = Channel::store(v[c]);
-            for (; p < end; p += C)
-                for (int c = 0; c < C; ++c) p[c] = stored[c];
-        }
+        for (; p < end; p += C) solid.write(p);
     }
 
     static void maskedPixel(T* row, const AASpan& span, int px, const Rgba& colour) {
@@ -124,7 +137,10 @@ struct Writer {
         }
         for (; px < span._maxX1; px += 8) maskedPixel(row, span, px, colour);
         const int interiorEnd = span._minX2 & ~7;
-        for (; px < interiorEnd; px += 8) writePixel(row + static_cast<std::ptrdiff_t>(px >> 3) * C, colour, colour.a);
+        if (px < interiorEnd) {
+            const Solid solid(colour);
+            for (; px < interiorEnd; px += 8) solid.write(row + static_cast<std::ptrdiff_t>(px >> 3) * C);
+        }
         for (; px < maxX2; px += 8) maskedPixel(row, span, px, colour);
     }
 };

@@ -43,7 +43,8 @@ bool RsAccumulationRenderer::beginFrame(const GeRectangle<int>& region, const Ix
         _outputGuard = WriteGuardNoCheck();
     } else {
         _outputGuard = output;
-        const IxPixelFormat::Comps comps = format._comps == IxPixelFormat::ALPHA ? IxPixelFormat::ALPHA : IxPixelFormat::RGBA;
+        const IxPixelFormat::Comps comps =
+            format._comps == IxPixelFormat::ALPHA ? IxPixelFormat::ALPHA : IxPixelFormat::RGBA;
         const IxTile target(IxPixelFormat(comps, IxPixelFormat::FLOAT32, format._aspectRatio), output._rectangle,
                             CoRgbaColorTyped<float>(0.0f, 0.0f, 0.0f, 0.0f));
         _accumulationGuard = WriteGuardNoCheck(target);
