@@ -121,12 +121,15 @@ TEST(Rs2DBuffer, ClippedTrianglesCoverWhatTheUnclippedOnesCoverInTheTile) {
 }
 
 // Anti-aliased triangles at the tile's corners, along its top rows and as tall as the tile, some
-// reaching outside it: the sub-pixel spans of tall triangles arrive at rows above the tile, and
-// nothing may be written there (under the address sanitizer a stray write fails). What is
-// written inside the tile is bounded by the coverage: alpha stays within [0, 1].
-TEST(Rs2DBuffer, AntialiasedTrianglesWriteOnlyInsideTheTile) {
+// reaching outside it, and triangles of both kinds reaching a thousand billion billion pixels away:
+// the sub-pixel spans of tall triangles arrive at rows above the tile, and a clipped vertex is
+// only inside the tile when it is put on the limit it was made for. Nothing may be written
+// outside the tile (under the address sanitizer a stray write fails); inside, alpha stays within
+// [0, 1].
+TEST(Rs2DBuffer, TrianglesWriteOnlyInsideTheTile) {
     const GeRectangle<int> rect{3, 40, -20, 50};
     std::mt19937 rng(9);
+    std::uniform_real_distribution<float> far(-1e30f, 1e30f);
     for (const Format& format : {Format{4, 8}, Format{1, 32}, Format{3, 16}}) {
         IxTile tile(format.pixelFormat(), rect, {});
         const IxWriteGuard g(tile);
@@ -139,6 +142,9 @@ TEST(Rs2DBuffer, AntialiasedTrianglesWriteOnlyInsideTheTile) {
             std::array<Pt, 3> p;
             for (Pt& q : p) q = {randomCoord(rng, cx - reach, cx + reach), randomCoord(rng, cy - 3, cy + reach)};
             buffer.rasterizeUnclippedAATriangle(vertex(p[0]), vertex(p[1]), vertex(p[2]));
+            const Rs2DVertex a{far(rng), far(rng)}, b{far(rng), far(rng)}, c{far(rng), far(rng)};
+            if (n % 2 == 0) buffer.rasterizeUnclippedTriangle(a, b, c);
+            else buffer.rasterizeUnclippedAATriangle(a, b, c);
         }
         for (int y = rect.y0; y < rect.y1; ++y)
             for (int x = rect.x0; x < rect.x1; ++x) {

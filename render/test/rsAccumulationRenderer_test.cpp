@@ -86,7 +86,8 @@ TEST(RsAccumulationRenderer, FrameOfAStillSceneEqualsTheSingleRender) {
             RsAccumulationRenderer accumulated;
             for (RsRenderer* r : {&single, static_cast<RsRenderer*>(&accumulated)})
                 r->setFillColor({0.2f, 0.4f, 0.6f, 0.6f});
-            const IxWriteGuard want = makeTile(format, rect), got = makeTile(format, rect);
+            // The output starts with other pixels: the first pass must replace them.
+            const IxWriteGuard want = makeTile(format, rect), got = makeTile(format, rect, {0.5f, 0.5f, 0.5f, 0.5f});
             single.render(camera, scene, rect, want);
             configure(accumulated, s);
             EXPECT_EQ(renderLoop(accumulated, camera, scene, rect, got), int(s.samples)) << where;
