@@ -145,12 +145,16 @@ RCShdPtr<RsScene> ZrSampleScene::makeUnlitScene(const ZrSceneKit::ShaderMaker& s
     return ZrSceneKit::makeScene(std::move(instances));
 }
 
-RCShdPtr<SdInstance> ZrSampleScene::makeCamera(int width, int height, double seconds) {
+namespace {
+const GePoint3<double> kEye{0.0, 3.4, 8.0};
+const GePoint3<double> kTarget{0.0, 0.7, 0.0};
+}  // namespace
+
+RCShdPtr<SdInstance> ZrSampleScene::makeCamera(int width, int height) {
     const double aspect = height > 0 ? static_cast<double>(width) / height : 1.0;
-    const double angle = seconds * (2.0 * 3.14159265358979323846 / 8.0);
-    const GePoint3<double> eye = seconds == 0.0 ? GePoint3<double>{0.0, 3.4, 8.0}
-                                                : GePoint3<double>{8.0 * std::sin(angle), 3.4, 8.0 * std::cos(angle)};
-    return ZrSceneKit::makeCamera(eye, {0.0, 0.7, 0.0}, 40.0, aspect, 0.5f, 50.0f);
+    return ZrSceneKit::makeCamera(kEye, kTarget, 40.0, aspect, 0.5f, 50.0f);
 }
+
+double ZrSampleScene::focusDistance() { return (kEye - kTarget).length(); }
 
 }  // namespace Zr

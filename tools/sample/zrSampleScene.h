@@ -34,9 +34,10 @@ public:
     // The description's geometry without lights, each material shaded by a shader of shaderMaker.
     static RCShdPtr<RsScene> makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker =
                                                 ZrSceneKit::diffuseShaderMaker());
-    // The camera for a picture of width by height pixels, at the given time of the scene's
-    // animation: the camera circles the scene once in eight seconds, from the front at time 0.
-    static RCShdPtr<SdInstance> makeCamera(int width, int height, double seconds = 0.0);
+    // The camera for a picture of width by height pixels.
+    static RCShdPtr<SdInstance> makeCamera(int width, int height);
+    // The distance from the camera to the middle of the scene, where depth of field is sharpest.
+    static double focusDistance();
 };
 
 }  // namespace Zr
