@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "exRenderCancelled.h"
+#include "geCameraBuilder.h"
 #include "ixPixelConvert.h"
 #include "ixReadGuard.h"
 #include "ixWriteGuard.h"
@@ -796,5 +797,22 @@ private:
     int _comps;
     std::vector<std::uint32_t> _bits;
 };
+
+// ---- Random views ------------------------------------------------------------------------------
+
+// A random rigid move: a translation of up to 5 along each axis after a rotation of up to 3
+// radians about a random axis; unit draws in -1..1.
+inline GeAffineMatrix3<float> randomMove(std::mt19937& rng, std::uniform_real_distribution<float>& unit) {
+    return GeAffineMatrix3<float>::makeTranslation({5 * unit(rng), 5 * unit(rng), 5 * unit(rng)}) *
+           GeAffineMatrix3<float>::makeRotation({unit(rng), unit(rng), unit(rng)}, 3 * unit(rng));
+}
+
+// A perspective frustum from 1 to farDistance whose sides lie up to 0.3 away from -1 and 1; unit
+// draws in -1..1.
+inline GeProjectiveMatrix3<float> randomFrustum(std::mt19937& rng, std::uniform_real_distribution<float>& unit,
+                                                float farDistance) {
+    return GeCameraBuilder<float>::makeFrustum(-1 + 0.3f * unit(rng), 1 + 0.3f * unit(rng), -1 + 0.3f * unit(rng),
+                                               1 + 0.3f * unit(rng), 1, farDistance);
+}
 
 }  // namespace Zr::RsTest
