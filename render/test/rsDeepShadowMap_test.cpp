@@ -9,7 +9,6 @@
 #include <random>
 #include <vector>
 
-#include "geCameraBuilder.h"
 #include "rsDeepShadowMap.h"
 #include "rsShadowPass.h"
 #include "rsTestSupport.h"
@@ -98,15 +97,10 @@ TEST(RsDeepShadowMap, RandomStacksGiveTheProductOfTheirLayersCutAtBlackness) {
 TEST(RsDeepShadowMap, QueriesMatchTheCellsCurvesThroughRandomMatrices) {
     std::mt19937 rng(62);
     std::uniform_real_distribution<float> unit(-1.0f, 1.0f);
-    const auto randomMove = [&] {
-        return GeAffineMatrix3<float>::makeTranslation({5 * unit(rng), 5 * unit(rng), 5 * unit(rng)}) *
-               GeAffineMatrix3<float>::makeRotation({unit(rng), unit(rng), unit(rng)}, 3 * unit(rng));
-    };
     for (int trial = 0; trial < 8; ++trial) {
         const int size = trial % 2 ? 12 : 5;
-        const GeAffineMatrix3<float> light = randomMove(), camera = randomMove();
-        const GeProjectiveMatrix3<float> projection = GeCameraBuilder<float>::makeFrustum(
-            -1 + 0.3f * unit(rng), 1 + 0.3f * unit(rng), -1 + 0.3f * unit(rng), 1 + 0.3f * unit(rng), 1, 20);
+        const GeAffineMatrix3<float> light = randomMove(rng, unit), camera = randomMove(rng, unit);
+        const GeProjectiveMatrix3<float> projection = randomFrustum(rng, unit, 20);
         const float bias = trial == 0 ? 0.0f : 0.5f * unit(rng), range = 3.0f * (unit(rng) + 1.0f);
         RsDeepShadowMap source;
         source.setSize(size);

@@ -9,7 +9,6 @@
 #include <vector>
 
 #include "geAlignedBox3.h"
-#include "geCameraBuilder.h"
 #include "rsCubeShadowMap.h"
 #include "rsShadowMap.h"
 #include "rsTestSupport.h"
@@ -25,15 +24,10 @@ using Rgb = CoRgbColorTyped<float>;
 TEST(RsShadowMapTest, QueriesMatchBruteForceThroughRandomMatrices) {
     std::mt19937 rng(63);
     std::uniform_real_distribution<float> unit(-1.0f, 1.0f);
-    const auto randomMove = [&] {
-        return GeAffineMatrix3<float>::makeTranslation({5 * unit(rng), 5 * unit(rng), 5 * unit(rng)}) *
-               GeAffineMatrix3<float>::makeRotation({unit(rng), unit(rng), unit(rng)}, 3 * unit(rng));
-    };
     for (int trial = 0; trial < 10; ++trial) {
         const int size = trial % 2 ? 24 : 5;
-        const GeAffineMatrix3<float> light = randomMove(), camera = randomMove();
-        GeProjectiveMatrix3<float> projection = GeCameraBuilder<float>::makeFrustum(
-            -1 + 0.3f * unit(rng), 1 + 0.3f * unit(rng), -1 + 0.3f * unit(rng), 1 + 0.3f * unit(rng), 1, 50);
+        const GeAffineMatrix3<float> light = RsTest::randomMove(rng, unit), camera = RsTest::randomMove(rng, unit);
+        GeProjectiveMatrix3<float> projection = RsTest::randomFrustum(rng, unit, 50);
         for (int k : {2, 6, 10, 14}) projection._m[k] = 7 * unit(rng);
         const float bias = 0.1f * unit(rng), range = 3.0f * (unit(rng) + 1.0f);
         RsShadowMap source, map;

@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <bit>
 #include <cmath>
+#include <cstdint>
 #include <cstring>
 #include <functional>
 #include <optional>
@@ -16,6 +17,7 @@
 #include <vector>
 
 #include "exRenderCancelled.h"
+#include "geCameraBuilder.h"
 #include "ixPixelConvert.h"
 #include "ixReadGuard.h"
 #include "ixWriteGuard.h"
@@ -716,6 +718,125 @@ inline Rgba flattenFrontToBack(const float* samples, std::size_t count, std::siz
         a += (1 - a) * s[3];
     }
     return Rgba(float(r), float(g), float(b), float(a));
+}
+
+// ---- Flat 2D fills -------------------------------------------------------------------------------
+//
+// The picture that a 2D fill leaves, from its documented parts: the fill rule (whole pixels, or
+// 8 x 4 samples), the coverage masks whose right end counts the sample it lands on, the rows at
+// which 8 x 4 spans arrive, and the write formulas per format and mode. Triangles lie inside the
+// tile, on the 1/256 grid.
+
+// Bits of one channel after a fill of colour at the given coverage (1 for plain triangles) over a
+// channel holding old: rgbaIndex says which channel of the colour it is (3 for alpha).
+inline std::uint32_t filledChannel(int depth, bool blending, const Rgba& colour, float coverage, int rgbaIndex,
+                                   std::uint32_t old) {
+    const float alpha = colour.a * coverage;
+    if (!blending) return floatToBits(depth, rgbaIndex == 3 ? alpha : channelOf(colour, rgbaIndex));
+    const float source = rgbaIndex == 3 ? alpha : channelOf(colour, rgbaIndex) * alpha;
+    const float keep = 1.0f - alpha;
+    if (depth == 8) return std::uint32_t(std::clamp(int(source * 255.0f + float(old) * keep), 0, 255));
+    if (depth == 16)
+        return IxPixelConvert::floatToHalf(source + IxPixelConvert::halfToFloat(std::uint16_t(old)) * keep);
+    return std::bit_cast<std::uint32_t>(source + std::bit_cast<float>(old) * keep);
+}
+
+// The tile's channels as raw bits, changed as fills would change them.
+class FillReference {
+public:
+    explicit FillReference(const IxWriteGuard& g) : _g(g), _r(g._rectangle), _comps(g._pixelFormat._comps) {
+        for (int y = _r.y0; y < _r.y1; ++y)
+            for (int x = _r.x0; x < _r.x1; ++x)
+                for (int c = 0; c < _comps; ++c) _bits.push_back(rawChannel(g, x, y, c));
+    }
+
+    void fillPlain(Pt a, Pt b, Pt c, const Rgba& colour, bool blending) {
+        const ReferenceTriangle t(a, b, c, _r.x0, _r.y0, 0, 0);
+        for (i64 y = t.rowBegin(); y < t.rowEnd(); ++y)
+            for (i64 x = t.colBegin(); x < t.colEnd(); ++x)
+                if (t.covers(x, y)) write(int(x), int(y), colour, 1.0f, blending);
+    }
+
+    // Anti-aliased: per sub-scanline the start x1 and end x2 of the exact fill rule (ceilings of
+    // the edges' crossings, also where they meet); per pixel row the pixels from the smallest start
+    // to the largest end, each with its mask; the row moved as the 8 x 4 spans are delivered, in
+    // blocks of blockHeight pixel rows, and dropped when it leaves the tile.
+    void fillAA(Pt a, Pt b, Pt c, const Rgba& colour, bool blending, int blockHeight) {
+        const Pt w[3] = {toWalk(a), toWalk(b), toWalk(c)};
+        const i64 top = ceilDiv(std::min({w[0].y, w[1].y, w[2].y}), kWalkUnit);
+        const i64 end = ceilDiv(std::max({w[0].y, w[1].y, w[2].y}), kWalkUnit);
+        const i64 sideA = (w[1].x - w[0].x) * (w[2].y - w[0].y) - (w[1].y - w[0].y) * (w[2].x - w[0].x);
+        if (top == end || sideA == 0) return;
+        const i64 firstRow = floorDiv(top, 4), lastRow = floorDiv(end - 1, 4);
+        for (i64 row = firstRow; row <= lastRow; ++row) {
+            i64 x1[4], x2[4], minX1 = INT64_MAX, maxX2 = INT64_MIN;
+            for (int r = 0; r < 4; ++r) {
+                const i64 sy = 4 * row + r;
+                x1[r] = x2[r] = -1;
+                if (sy < top || sy >= end) continue;
+                x1[r] = INT64_MAX;
+                x2[r] = INT64_MIN;
+                for (int e = 0; e < 3; ++e) {
+                    const Pt& p = w[e];
+                    const Pt& q = w[(e + 1) % 3];
+                    const i64 y = sy * kWalkUnit;
+                    if (p.y == q.y || y < std::min(p.y, q.y) || y > std::max(p.y, q.y)) continue;
+                    const i64 den = q.y - p.y, num = p.x * den + (q.x - p.x) * (y - p.y);
+                    const i64 x = den > 0 ? ceilDiv(num, den * kWalkUnit) : ceilDiv(-num, -den * kWalkUnit);
+                    x1[r] = std::min(x1[r], x), x2[r] = std::max(x2[r], x);
+                }
+                minX1 = std::min(minX1, x1[r]), maxX2 = std::max(maxX2, x2[r]);
+            }
+            const i64 blockLast = std::min(firstRow + ((row - firstRow) / blockHeight + 1) * blockHeight - 1, lastRow);
+            const i64 delivered = row - blockLast + floorDiv(blockLast, 2);
+            if (delivered < 0 || delivered >= _r.getHeight()) continue;
+            for (i64 px = floorDiv(minX1, 8); 8 * px < maxX2; ++px) {
+                int samples = 0;
+                for (int r = 0; r < 4; ++r)
+                    for (i64 s = 8 * px; s < 8 * px + 8; ++s) samples += x1[r] != -1 && x1[r] <= s && s <= x2[r];
+                write(int(px), int(delivered), colour, float(samples) * 0.03125f, blending);
+            }
+        }
+    }
+
+    void expectEqual(const std::string& where) const {
+        std::size_t i = 0;
+        for (int y = _r.y0; y < _r.y1; ++y)
+            for (int x = _r.x0; x < _r.x1; ++x)
+                for (int c = 0; c < _comps; ++c, ++i)
+                    ASSERT_EQ(rawChannel(_g, x, y, c), _bits[i])
+                        << where << " pixel " << x << ", " << y << " channel " << c;
+    }
+
+private:
+    Pt toWalk(Pt p) const { return {walk(p.x, _r.x0, 3), walk(p.y, _r.y0, 2)}; }
+    // Pixel (x, y) relative to the tile.
+    void write(int x, int y, const Rgba& colour, float coverage, bool blending) {
+        std::uint32_t* p = &_bits[(std::size_t(y) * _r.getWidth() + x) * _comps];
+        for (int c = 0; c < _comps; ++c)
+            p[c] = filledChannel(_g._pixelFormat._depth, blending, colour, coverage, rgbaIndexOf(_comps, c), p[c]);
+    }
+    IxWriteGuard _g;
+    GeRectangle<int> _r;
+    int _comps;
+    std::vector<std::uint32_t> _bits;
+};
+
+// ---- Random views ------------------------------------------------------------------------------
+
+// A random rigid move: a translation of up to 5 along each axis after a rotation of up to 3
+// radians about a random axis; unit draws in -1..1.
+inline GeAffineMatrix3<float> randomMove(std::mt19937& rng, std::uniform_real_distribution<float>& unit) {
+    return GeAffineMatrix3<float>::makeTranslation({5 * unit(rng), 5 * unit(rng), 5 * unit(rng)}) *
+           GeAffineMatrix3<float>::makeRotation({unit(rng), unit(rng), unit(rng)}, 3 * unit(rng));
+}
+
+// A perspective frustum from 1 to farDistance whose sides lie up to 0.3 away from -1 and 1; unit
+// draws in -1..1.
+inline GeProjectiveMatrix3<float> randomFrustum(std::mt19937& rng, std::uniform_real_distribution<float>& unit,
+                                                float farDistance) {
+    return GeCameraBuilder<float>::makeFrustum(-1 + 0.3f * unit(rng), 1 + 0.3f * unit(rng), -1 + 0.3f * unit(rng),
+                                               1 + 0.3f * unit(rng), 1, farDistance);
 }
 
 }  // namespace Zr::RsTest

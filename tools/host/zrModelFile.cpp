@@ -319,6 +319,12 @@ ZrModelFile::ZrModelFile(const std::string& path) : _model(std::make_unique<Mode
 
 ZrModelFile::~ZrModelFile() = default;
 
+GePoint3<double> ZrModelFile::centreAt(double seconds) const {
+    const Bounds bounds = _model->boundsAt(_model->worldAt(seconds));
+    if (bounds.isEmpty()) return {0.0, 0.0, 0.0};
+    return {(bounds.lo.x + bounds.hi.x) / 2, (bounds.lo.y + bounds.hi.y) / 2, (bounds.lo.z + bounds.hi.z) / 2};
+}
+
 const std::vector<std::string>& ZrModelFile::warnings() const { return _model->warnings; }
 
 std::vector<std::string> ZrModelFile::cameraNames() const {

@@ -46,6 +46,8 @@ public:
     // the file's first camera, or one that frames the scene when the file has none. An unknown
     // name throws ZrHostError listing the names there are.
     RCShdPtr<SdInstance> cameraAt(const std::string& name, double seconds, double aspect) const;
+    // The middle of the model's bounds at the given time.
+    GePoint3<double> centreAt(double seconds) const;
     // What reading noticed and worked around (textures left out, meshes skipped), one line each.
     const std::vector<std::string>& warnings() const;
 

@@ -68,7 +68,7 @@ RCShdPtr<SdInstance> lightAt(const RCShdPtr<SdStdLight>& light, unsigned int num
 
 }  // namespace
 
-RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options) {
+RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options, double seconds) {
     ZrDiffuseMaterial::registerShaderBuilder();
     RCShdPtr<SdScene> scene = makeShared<SdScene>();
 
@@ -80,10 +80,12 @@ RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options) {
                               {lightCells, standard({0.30f, 0.33f, 0.38f}, {0.35f, 0.35f, 0.35f}, 0.5f)},
                               ZrSceneKit::makePlacement({0, 0, 0})));
 
-    // An opaque red sphere on the left, with a sharp highlight.
+    // An opaque red sphere on the left, with a sharp highlight, swinging left and right once in
+    // two seconds (about 2.5 units a second through the middle).
     scene->addGeometry(placed(ZrShapes::makeSphere(1.0f, 32, 16),
                               {standard({0.85f, 0.18f, 0.12f}, {0.8f, 0.8f, 0.8f}, 0.6f)},
-                              ZrSceneKit::makePlacement({-1.7, 1.0, 0.0})));
+                              ZrSceneKit::makePlacement({-1.7 + 0.8 * std::sin(3.14159265358979323846 * seconds),
+                                                         1.0, 0.0})));
 
     // A green torus standing on its rim on the right, turned towards the camera, half transparent,
     // in the host's own material.
@@ -91,7 +93,7 @@ RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options) {
     torus->_diffuse = {0.15f, 0.80f, 0.30f};
     torus->_opacity = 0.55f;
     scene->addGeometry(placed(ZrShapes::makeTorus(0.85f, 0.3f, 40, 16), {torus},
-                              ZrSceneKit::makePlacement({1.7, 1.15, 0.2}, {1.0, -0.35, 0.0}, 80.0)));
+                              ZrSceneKit::makePlacement({1.7, 1.15, 0.2}, {1.0, -0.35, 0.0}, 80.0 + 180.0 * seconds)));
 
     // A blue cube in front, turned about the vertical, half clear and laid over the scene in the
     // screen mode; its shadow in deep maps is blue.
@@ -126,9 +128,9 @@ RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options) {
     return scene;
 }
 
-RCShdPtr<RsScene> ZrSampleScene::makeScene(const Options& options) {
+RCShdPtr<RsScene> ZrSampleScene::makeScene(const Options& options, double seconds) {
     RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
-    builder->addScene(makeDescription(options));
+    builder->addScene(makeDescription(options, seconds));
     return builder->createRendererScene();
 }
 
@@ -143,12 +145,16 @@ RCShdPtr<RsScene> ZrSampleScene::makeUnlitScene(const ZrSceneKit::ShaderMaker& s
     return ZrSceneKit::makeScene(std::move(instances));
 }
 
-RCShdPtr<SdInstance> ZrSampleScene::makeCamera(int width, int height, double seconds) {
+namespace {
+const GePoint3<double> kEye{0.0, 3.4, 8.0};
+const GePoint3<double> kTarget{0.0, 0.7, 0.0};
+}  // namespace
+
+RCShdPtr<SdInstance> ZrSampleScene::makeCamera(int width, int height) {
     const double aspect = height > 0 ? static_cast<double>(width) / height : 1.0;
-    const double angle = seconds * (2.0 * 3.14159265358979323846 / 8.0);
-    const GePoint3<double> eye = seconds == 0.0 ? GePoint3<double>{0.0, 3.4, 8.0}
-                                                : GePoint3<double>{8.0 * std::sin(angle), 3.4, 8.0 * std::cos(angle)};
-    return ZrSceneKit::makeCamera(eye, {0.0, 0.7, 0.0}, 40.0, aspect, 0.5f, 50.0f);
+    return ZrSceneKit::makeCamera(kEye, kTarget, 40.0, aspect, 0.5f, 50.0f);
 }
+
+double ZrSampleScene::focusDistance() { return (kEye - kTarget).length(); }
 
 }  // namespace Zr

@@ -23,16 +23,21 @@ class ZrSampleScene {
 public:
     using Options = ZrShadowOptions;
 
-    // The scene description: geometry instances with their materials, and the three lights.
-    static RCShdPtr<SdScene> makeDescription(const Options& options = {});
-    // The lit renderer scene of the description, made by RsSceneBuilder.
-    static RCShdPtr<RsScene> makeScene(const Options& options = {});
+    // The scene description at the given time of its animation: geometry instances with their
+    // materials, and the three lights casting shadows as the options say. The sphere swings left
+    // and right and the torus turns; at time 0 the scene is the still picture. The sphere swings
+    // 0.8 units each way once in two seconds; the torus turns about its tilted axis half a turn a
+    // second.
+    static RCShdPtr<SdScene> makeDescription(const Options& options = {}, double seconds = 0.0);
+    // The lit renderer scene of the description at that time, made by RsSceneBuilder.
+    static RCShdPtr<RsScene> makeScene(const Options& options = {}, double seconds = 0.0);
     // The description's geometry without lights, each material shaded by a shader of shaderMaker.
     static RCShdPtr<RsScene> makeUnlitScene(const ZrSceneKit::ShaderMaker& shaderMaker =
                                                 ZrSceneKit::diffuseShaderMaker());
-    // The camera for a picture of width by height pixels, at the given time of the scene's
-    // animation: the camera circles the scene once in eight seconds, from the front at time 0.
-    static RCShdPtr<SdInstance> makeCamera(int width, int height, double seconds = 0.0);
+    // The camera for a picture of width by height pixels.
+    static RCShdPtr<SdInstance> makeCamera(int width, int height);
+    // The distance from the camera to the middle of the scene, where depth of field is sharpest.
+    static double focusDistance();
 };
 
 }  // namespace Zr

@@ -6,6 +6,7 @@
 // 2 a usage error, 130 cancelled by Ctrl-C (no file written).
 #include <unistd.h>
 
+#include <algorithm>
 #include <exception>
 #include <iostream>
 #include <memory>
@@ -14,7 +15,7 @@
 #include "exBase.h"
 #include "exRenderCancelled.h"
 #include "pxRequestMgr.h"
-#include "rsSceneBuilder.h"
+#include "sdCamera.h"
 #include "zrHostError.h"
 #include "zrImageFile.h"
 #include "zrInfoReport.h"
@@ -70,23 +71,33 @@ int run(const ZrOptions& options) {
     const InstalledHandler installed(progress);
     const double aspect = static_cast<double>(options.width) / options.height;
     int status = 0;
+    // The scene and the camera at a time of the animation; each thread and pass has its own.
+    const auto momentAt = [&](double seconds) {
+        const RCShdPtr<SdScene> description = model ? model->sceneAt(seconds, options.shadows)
+                                                    : ZrSampleScene::makeDescription(options.shadows, seconds);
+        const RCShdPtr<SdInstance> camera = model ? model->cameraAt(options.camera, seconds, aspect)
+                                                  : ZrSampleScene::makeCamera(options.width, options.height);
+        if (options.accumulation.depthOfField) {
+            // The focal plane: as asked, or through the middle of the scene.
+            SdCamera& lens = dynamic_cast<SdCamera&>(*camera->getObject());
+            double distance = options.focusDistance;
+            if (!(distance > 0.0)) {
+                const GeVector3<float> eye = camera->getMatrix().getTranslation();
+                distance = model ? (model->centreAt(seconds) - GePoint3<double>{eye.x, eye.y, eye.z}).length()
+                                 : ZrSampleScene::focusDistance();
+            }
+            lens._focalDistance = static_cast<float>(std::max(distance, 1e-6));
+        }
+        return ZrTileRenderer::momentOf(description, camera);
+    };
     for (int frame = options.firstFrame; frame <= options.lastFrame; ++frame) {
         const double seconds = options.framesGiven ? frame / options.framesPerSecond : 0.0;
-        const RCShdPtr<SdScene> description = model ? model->sceneAt(seconds, options.shadows)
-                                                         : ZrSampleScene::makeDescription(options.shadows);
-        const RCShdPtr<SdInstance> camera = model ? model->cameraAt(options.camera, seconds, aspect)
-                                                  : ZrSampleScene::makeCamera(options.width, options.height, seconds);
-        const auto makeScene = [&description] {
-            RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
-            builder->addScene(description);
-            return builder->createRendererScene();
-        };
         progress->startFrame(frame - options.firstFrame + 1, options.frameCount(),
                              ZrTileRenderer::tileCount(options.width, options.height, options.tileSize));
         ZrPassImages passes(passList, !options.deep.empty(), options.width, options.height);
         settings.passes = &passes;
-        const OIIO::ImageBuf picture =
-            ZrTileRenderer::render(makeScene, camera, options.width, options.height, settings, progress.get());
+        const OIIO::ImageBuf picture = ZrTileRenderer::render(momentAt, seconds, options.width, options.height,
+                                                              settings, options.accumulation, progress.get());
         progress->finish();
         // Ctrl-C after the last scanline still cancels: nothing is written.
         if (ZrRenderProgress::interrupted()) throw ExRenderCancelled();

@@ -90,12 +90,32 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
         ->check(CLI::Range(8, 4096));
     app.add_option_function<std::string>("--frames", [&o](const std::string& v) { parseFrames(v, o); },
                                          "render the frames FIRST to LAST of the animation (the model file's "
-                                         "first, or the sample scene's orbit), one file each")
+                                         "first, or the sample scene's: the sphere swings, the torus turns), one file each")
         ->type_name("FIRST-LAST");
     app.add_option("--fps", o.framesPerSecond, "frames per second of the animation (default 24)")
         ->type_name("F")
         ->check(CLI::Range(0.001, 100000.0));
     app.add_flag("--float", o.floatPixels, "float pixels (OpenEXR: 32-bit float instead of half; TIFF: float)");
+    app.add_flag("--motion-blur", o.accumulation.motionBlur,
+                 "motion blur: --samples passes at times spread over the shutter's opening");
+    app.add_option("--samples", o.accumulation.samples,
+                   "passes of --motion-blur and --dof (default 8)")
+        ->type_name("N")
+        ->check(CLI::Range(1, 1024));
+    app.add_option("--shutter", o.accumulation.shutter,
+                   "the shutter's opening as a fraction of a frame (default 1)")
+        ->type_name("W")
+        ->check(CLI::Range(0.0f, 100.0f));
+    app.add_flag("--dof", o.accumulation.depthOfField,
+                 "depth of field: --samples passes through points of the lens");
+    app.add_option("--focus-distance", o.focusDistance,
+                   "distance from the camera that --dof keeps sharp (default: the scene's middle)")
+        ->type_name("D")
+        ->check(CLI::PositiveNumber);
+    app.add_option("--aperture", o.accumulation.aperture,
+                   "side of the square of lens points of --dof, in scene units (default 0.1)")
+        ->type_name("A")
+        ->check(CLI::Range(0.0f, 1e6f));
     app.add_flag("-a,--antialias", o.antialiasing,
                  "antialias: sixteen samples per pixel, resolved through the --filter kernel");
     std::map<std::string, RsFilterKernel::KernelType> kernels;
@@ -145,6 +165,9 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
     try {
         app.parse(argc, argv);
         o.outputGiven = app.count("--output") > 0;
+        const double rate = o.framesPerSecond;
+        o.accumulation.framesPerSecond = rate == static_cast<int>(rate) ? Rational(static_cast<int>(rate), 1)
+                                                                         : Rational(static_cast<int>(rate * 1000), 1000);
         if (o.frameCount() > 1 && o.output.find('#') == std::string::npos)
             throw CLI::ValidationError("--output", "needs a # pattern, such as out.####.png, for several frames");
         if (!o.compare.empty() && o.frameCount() > 1)

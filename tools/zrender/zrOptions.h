@@ -5,6 +5,7 @@
 #include "coRgbaColorTyped.h"
 #include "rsFilterKernel.h"
 #include "zrShadowOptions.h"
+#include "zrTileRenderer.h"
 
 namespace Zr {
 
@@ -36,6 +37,10 @@ struct ZrOptions {
     std::string passes;
     std::string deep;
     ZrShadowOptions shadows;
+    // Motion blur and depth of field (the frame rate is framesPerSecond's).
+    ZrAccumulationSettings accumulation;
+    // Distance of the plane that depth of field keeps sharp; unset (0): the scene's middle.
+    double focusDistance = 0.0;
 
     // Reads the arguments. Returns -1 when zrender is to go on, otherwise the exit status: 0 after
     // printing the help, 2 after printing a usage error of one line on standard error.

@@ -5,7 +5,6 @@
 #include <utility>
 
 #include "rsAreaFilter.h"
-#include "rsTolerance.h"
 
 namespace Zr {
 
@@ -43,46 +42,38 @@ RsDeepShadowMap::RsDeepShadowMap() = default;
 
 RsDeepShadowMap::~RsDeepShadowMap() = default;
 
-RsDeepShadowMap::RsDeepShadowMap(RsDeepShadowMap& other) : RsShadowEvaluator(other) { takeFrom(other); }
+RsDeepShadowMap::RsDeepShadowMap(RsDeepShadowMap& other) : RsSquareShadowMap(other) { takeBlocksFrom(other); }
 
-RsDeepShadowMap::RsDeepShadowMap(RsDeepShadowMap&& other) : RsShadowEvaluator(other) { takeFrom(other); }
+RsDeepShadowMap::RsDeepShadowMap(RsDeepShadowMap&& other) : RsSquareShadowMap(other) { takeBlocksFrom(other); }
 
 RsDeepShadowMap& RsDeepShadowMap::operator=(RsDeepShadowMap& other) {
-    if (this != &other) takeFrom(other);
+    if (this != &other) {
+        RsSquareShadowMap::operator=(other);
+        takeBlocksFrom(other);
+    }
     return *this;
 }
 
 RsDeepShadowMap& RsDeepShadowMap::operator=(RsDeepShadowMap&& other) { return *this = other; }
 
-void RsDeepShadowMap::takeFrom(RsDeepShadowMap& other) {
+void RsDeepShadowMap::takeBlocksFrom(RsDeepShadowMap& other) {
     // The blocks move with the curves that point into them.
-    _map = std::move(other._map);
     _blocks = std::move(other._blocks);
     _block = other._block;
     _blockUsed = other._blockUsed;
     other._blocks.clear();
     other._block = 0;
     other._blockUsed = 0;
-    _cameraToMap = other._cameraToMap;
-    _worldToMap = other._worldToMap;
-    _worldToShadowMap = other._worldToShadowMap;
-    _projection = other._projection;
-    _size = other._size;
-    _halfSize = other._halfSize;
-    _intSize = other._intSize;
-    _bias = other._bias;
     _biasZ = other._biasZ;
     _biasW = other._biasW;
-    _halfRange = other._halfRange;
 }
 
 CoRgbColorTyped<float> RsDeepShadowMap::computeFastShadow(const GePoint3<float>& point) const {
     if (!_map) return kLit;
     const MapPosition q = toMap(_cameraToMap, _halfSize, _biasZ, _biasW, point);
-    const float extent = static_cast<float>(_intSize);
-    // Written so that a coordinate that is not a number counts as off the map.
-    if (!(q.u >= 0.0f && q.u < extent && q.v >= 0.0f && q.v < extent)) return kLit;
-    return _map[static_cast<int>(q.v) * _intSize + static_cast<int>(q.u)].getTransmittance(q.depth);
+    const int index = cellIndex(q.u, q.v);
+    if (index < 0) return kLit;
+    return _map[index].getTransmittance(q.depth);
 }
 
 CoRgbColorTyped<float> RsDeepShadowMap::computeBestShadow(const GePoint3<float>& point) const {
@@ -94,15 +85,14 @@ CoRgbColorTyped<float> RsDeepShadowMap::computeBestShadow(const GePoint3<float>&
                         [depth, cells](int index) { return cells[index].getTransmittance(depth); });
 }
 
-void RsDeepShadowMap::dropMap() {
-    _map.reset();
+void RsDeepShadowMap::dropBlocks() {
     _blocks.clear();
     _block = 0;
     _blockUsed = 0;
 }
 
 void RsDeepShadowMap::allocateMap() {
-    const std::size_t cells = static_cast<std::size_t>(_intSize) * _intSize;
+    const std::size_t cells = getCellCount();
     // A map is dropped whenever its size changes, so one that is there has this size.
     if (_map) std::fill_n(_map.get(), cells, RsTransmittanceFunction());
     else _map = std::make_unique<RsTransmittanceFunction[]>(cells);
@@ -135,21 +125,12 @@ void RsDeepShadowMap::setFunction(int index, const Element* elements, int count)
 }
 
 void RsDeepShadowMap::setSize(float size) {
-    if (RsTolerance::isEqual(size, _size)) return;
-    dropMap();
-    _halfSize = 0.5f * size;
-    _size = size;
-    _intSize = static_cast<int>(size);
+    if (resize(size)) dropBlocks();
 }
-
-void RsDeepShadowMap::setRange(float range) { _halfRange = range * 0.5f; }
-
-void RsDeepShadowMap::setBias(float bias) { _bias = bias; }
 
 void RsDeepShadowMap::setMatrices(const GeAffineMatrix3<float>& worldToShadowMap,
                                   const GeProjectiveMatrix3<float>& projection) {
-    _worldToShadowMap = worldToShadowMap;
-    _projection = projection;
+    keepMatrices(worldToShadowMap, projection);
     // z' = 0.5 z + 0.5 w: the projected depth from -1..1 to 0..1 once divided by w.
     GeProjectiveMatrix3<float> remap;
     remap._m[10] = 0.5f;
@@ -167,16 +148,8 @@ void RsDeepShadowMap::setCameraMatrix(const GeAffineMatrix3<float>& cameraToWorl
 }
 
 void RsDeepShadowMap::dump(std::ostream& os) const {
-    os << " _map: " << static_cast<const void*>(_map.get()) << " _cameraToMap:";
-    _cameraToMap.dump(os);
-    os << " _worldToMap:";
-    _worldToMap.dump(os);
-    os << " _worldToShadowMap:";
-    _worldToShadowMap.dump(os);
-    os << " _projection:";
-    _projection.dump(os);
-    os << " _size: " << _size << " _halfSize: " << _halfSize << " _intSize: " << _intSize << " _bias: " << _bias
-       << " _biasZ: " << _biasZ << " _biasW: " << _biasW << " _halfRange: " << _halfRange
+    dumpShared(os);
+    os << " _biasZ: " << _biasZ << " _biasW: " << _biasW << " _halfRange: " << _halfRange
        << " _blocks: " << _blocks.size();
 }
 

@@ -14,8 +14,7 @@
 // The queries are those of RsShadowMap with a transmittance in place of the lit test: the single
 // cell under the point, or the area-weighted filter square (rsAreaFilter.h).
 //
-// Copying moves: construction from, and assignment of, a non-const map take its curves over and
-// leave it with none, while all other members are copied.
+// Copying moves the curves, with the storage of their elements (rsSquareShadowMap.h).
 #include <memory>
 #include <ostream>
 #include <vector>
@@ -24,12 +23,12 @@
 #include "geAffineMatrix3.h"
 #include "gePoint3.h"
 #include "geProjectiveMatrix3.h"
-#include "rsShadowEvaluator.h"
+#include "rsSquareShadowMap.h"
 #include "rsTransmittanceFunction.h"
 
 namespace Zr {
 
-class RsDeepShadowMap : public RsShadowEvaluator {
+class RsDeepShadowMap : public RsSquareShadowMap<RsTransmittanceFunction> {
 public:
     using Element = RsTransmittanceFunction::Element;
 
@@ -60,36 +59,22 @@ public:
     // A size equal to the current one within float tolerance changes nothing; any other drops
     // the curves.
     void setSize(float size);
-    float getSize() const { return _size; }
-    void setRange(float range);
-    // In the light's view-space units, towards the light; folded by the next setMatrices.
-    void setBias(float bias);
+    // The bias (setBias) is in the light's view-space units, towards the light; folded by the
+    // next setMatrices.
     void setMatrices(const GeAffineMatrix3<float>& worldToShadowMap, const GeProjectiveMatrix3<float>& projection);
     void setCameraMatrix(const GeAffineMatrix3<float>& cameraToWorld);
-
-    const GeAffineMatrix3<float>& getWorldToShadowMapMatrix() const { return _worldToShadowMap; }
-    const GeProjectiveMatrix3<float>& getProjectionMatrix() const { return _projection; }
 
     void dump(std::ostream& os) const;
 
 private:
-    void takeFrom(RsDeepShadowMap& other);
-    void dropMap();
+    // Takes the other map's blocks over, leaving it with none, and copies the folded bias.
+    void takeBlocksFrom(RsDeepShadowMap& other);
+    void dropBlocks();
     // Makes _block a block with room for count elements after the current one.
     void nextBlock(int count);
 
-    std::unique_ptr<RsTransmittanceFunction[]> _map;
-    GeProjectiveMatrix3<float> _cameraToMap;
-    GeProjectiveMatrix3<float> _worldToMap;
-    GeAffineMatrix3<float> _worldToShadowMap;
-    GeProjectiveMatrix3<float> _projection;
-    float _size = 0.0f;
-    float _halfSize = 0.0f;
-    int _intSize = 0;
-    float _bias = 0.0f;
     float _biasZ = 0.0f;
     float _biasW = 0.0f;
-    float _halfRange = 0.0f;
     // The elements of all curves, in blocks that never move. Blocks before _block are full,
     // _block is filled up to _blockUsed, and later ones are kept from a former rendering of a map
     // of this size, for the next one to fill again.

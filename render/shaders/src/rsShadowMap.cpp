@@ -1,10 +1,6 @@
 #include "rsShadowMap.h"
 
-#include <algorithm>
-#include <utility>
-
 #include "rsAreaFilter.h"
-#include "rsTolerance.h"
 
 namespace Zr {
 
@@ -35,44 +31,13 @@ inline MapPosition toMap(const GeProjectiveMatrix3<float>& matrix, float halfSiz
 
 }  // namespace
 
-RsShadowMap::RsShadowMap() = default;
-
-RsShadowMap::~RsShadowMap() = default;
-
-RsShadowMap::RsShadowMap(RsShadowMap& other) : RsShadowEvaluator(other) { takeFrom(other); }
-
-RsShadowMap::RsShadowMap(RsShadowMap&& other) : RsShadowEvaluator(other) { takeFrom(other); }
-
-RsShadowMap& RsShadowMap::operator=(RsShadowMap& other) {
-    if (this != &other) takeFrom(other);
-    return *this;
-}
-
-RsShadowMap& RsShadowMap::operator=(RsShadowMap&& other) { return *this = other; }
-
-void RsShadowMap::takeFrom(RsShadowMap& other) {
-    _map = std::move(other._map);
-    _cameraToMap = other._cameraToMap;
-    _worldToMap = other._worldToMap;
-    _worldToShadowMap = other._worldToShadowMap;
-    _projection = other._projection;
-    _size = other._size;
-    _halfSize = other._halfSize;
-    _intSize = other._intSize;
-    _bias = other._bias;
-    _halfRange = other._halfRange;
-}
-
 CoRgbColorTyped<float> RsShadowMap::computeFastShadow(const GePoint3<float>& point) const {
     if (!_map) return kLit;
     const MapPosition q = toMap(_cameraToMap, _halfSize, _bias, point);
-    // Outside the map's cells nothing casts a shadow. Written as the negation of "inside" so that
-    // a coordinate that is not a number also counts as outside.
-    const float extent = static_cast<float>(_intSize);
-    if (!(q.u >= 0.0f && q.u < extent && q.v >= 0.0f && q.v < extent)) return kLit;
-    const int i = static_cast<int>(q.u);
-    const int j = static_cast<int>(q.v);
-    return static_cast<double>(q.z) > _map[j * _intSize + i] ? kLit : kShadowed;
+    // Outside the map's cells nothing casts a shadow.
+    const int index = cellIndex(q.u, q.v);
+    if (index < 0) return kLit;
+    return static_cast<double>(q.z) > _map[index] ? kLit : kShadowed;
 }
 
 CoRgbColorTyped<float> RsShadowMap::computeBestShadow(const GePoint3<float>& point) const {
@@ -87,26 +52,13 @@ CoRgbColorTyped<float> RsShadowMap::computeBestShadow(const GePoint3<float>& poi
 }
 
 double* RsShadowMap::getMap() {
-    if (!_map) _map = std::make_unique_for_overwrite<double[]>(static_cast<std::size_t>(_intSize) * _intSize);
+    if (!_map) _map = std::make_unique_for_overwrite<double[]>(getCellCount());
     return _map.get();
 }
 
-void RsShadowMap::setSize(float size) {
-    if (RsTolerance::isEqual(size, _size)) return;
-    _map.reset();
-    _halfSize = 0.5f * size;
-    _size = size;
-    _intSize = static_cast<int>(size);
-}
-
-void RsShadowMap::setRange(float range) { _halfRange = range * 0.5f; }
-
-void RsShadowMap::setBias(float bias) { _bias = bias; }
-
 void RsShadowMap::setMatrices(const GeAffineMatrix3<float>& worldToShadowMap,
                               const GeProjectiveMatrix3<float>& projection) {
-    _worldToShadowMap = worldToShadowMap;
-    _projection = projection;
+    keepMatrices(worldToShadowMap, projection);
     // The map keeps view-space depth: the projection's depth row becomes the identity's, so that
     // z passes through unchanged while x, y and w are projected.
     GeProjectiveMatrix3<float> keepDepth = projection;
@@ -122,16 +74,8 @@ void RsShadowMap::setCameraMatrix(const GeAffineMatrix3<float>& cameraToWorld) {
 }
 
 void RsShadowMap::dump(std::ostream& os) const {
-    os << " _map: " << static_cast<const void*>(_map.get()) << " _cameraToMap:";
-    _cameraToMap.dump(os);
-    os << " _worldToMap:";
-    _worldToMap.dump(os);
-    os << " _worldToShadowMap:";
-    _worldToShadowMap.dump(os);
-    os << " _projection:";
-    _projection.dump(os);
-    os << " _size: " << _size << " _halfSize: " << _halfSize << " _intSize: " << _intSize << " _bias: " << _bias
-       << " _halfRange: " << _halfRange;
+    dumpShared(os);
+    os << " _halfRange: " << _halfRange;
 }
 
 }  // namespace Zr

@@ -17,31 +17,21 @@
 // (rsAreaFilter.h). A size that is not whole has its whole cells only: the fraction of a cell
 // beyond them counts as off the map. A map that was never asked for (null) lights everything.
 //
-// Copying moves: construction from, and assignment of, a non-const map take its cells over and
-// leave it with none, while all other members are copied.
-#include <memory>
+// Copying moves the cells (rsSquareShadowMap.h).
 #include <ostream>
 
 #include "coRgbColorTyped.h"
 #include "geAffineMatrix3.h"
 #include "gePoint3.h"
 #include "geProjectiveMatrix3.h"
-#include "rsShadowEvaluator.h"
+#include "rsSquareShadowMap.h"
 
 namespace Zr {
 
-class RsShadowMap : public RsShadowEvaluator {
+// A new map is empty, of size 0, with identity matrices. Its implicit copying and moving are
+// those of RsSquareShadowMap: they take the other map's cells over, leaving it with a null map.
+class RsShadowMap : public RsSquareShadowMap<double> {
 public:
-    // An empty map of size 0 with identity matrices.
-    RsShadowMap();
-    ~RsShadowMap() override;
-
-    // Take the other map's cells over, leaving it with a null map; every other member is copied.
-    RsShadowMap(RsShadowMap& other);
-    RsShadowMap(RsShadowMap&& other);
-    RsShadowMap& operator=(RsShadowMap& other);
-    RsShadowMap& operator=(RsShadowMap&& other);
-
     // The filtered answer: 1 where all of the filter square inside the map is lit, 0 where none
     // of it is, the lit fraction by area in between; the same in all three channels.
     CoRgbColorTyped<float> computeBestShadow(const GePoint3<float>& point) const override;
@@ -54,12 +44,8 @@ public:
 
     // A size equal to the current one within float tolerance changes nothing; any other drops the
     // map, so that the queries answer lit until it is rendered anew.
-    void setSize(float size);
-    float getSize() const { return _size; }
-    // The filter's full width in map cells.
-    void setRange(float range);
-    // Added to the query point's depth before it is compared.
-    void setBias(float bias);
+    void setSize(float size) { resize(size); }
+    // The bias (setBias) is added to the query point's depth before it is compared.
 
     // The light's view from world space and its projection; folds them, dropping the projection's
     // depth row. Takes effect on the queries at the next setCameraMatrix.
@@ -67,25 +53,7 @@ public:
     // From the render call's camera space to world space; completes the query's matrix.
     void setCameraMatrix(const GeAffineMatrix3<float>& cameraToWorld);
 
-    const GeAffineMatrix3<float>& getWorldToShadowMapMatrix() const { return _worldToShadowMap; }
-    const GeProjectiveMatrix3<float>& getProjectionMatrix() const { return _projection; }
-
     void dump(std::ostream& os) const;
-
-private:
-    void takeFrom(RsShadowMap& other);
-
-    std::unique_ptr<double[]> _map;
-    GeProjectiveMatrix3<float> _cameraToMap;
-    GeProjectiveMatrix3<float> _worldToMap;
-    GeAffineMatrix3<float> _worldToShadowMap;
-    GeProjectiveMatrix3<float> _projection;
-    float _size = 0.0f;
-    float _halfSize = 0.0f;
-    int _intSize = 0;
-    // Set by the light before any query; zero until then.
-    float _bias = 0.0f;
-    float _halfRange = 0.0f;
 };
 
 }  // namespace Zr

@@ -6,9 +6,8 @@
 namespace Zr {
 
 RsMZBuffer::RsMZBuffer(int width, int height, double* depth)
-    : _width(width), _height(height), _depth(depth), _rasterizer(*this, &RsMZBuffer::drawSpan) {
-    const std::size_t pixels = static_cast<std::size_t>(width) * static_cast<std::size_t>(height);
-    std::fill_n(_depth, pixels, kEmptyDepth);
+    : RsDepthMapBuffer(width, height, depth, static_cast<Rasterizer::DrawSpan>(&RsMZBuffer::drawSpan)) {
+    const std::size_t pixels = getPixelCount();
     _secondDepth = std::make_unique_for_overwrite<double[]>(pixels);
     std::fill_n(_secondDepth.get(), pixels, kEmptyDepth);
 }
@@ -33,15 +32,15 @@ void RsMZBuffer::drawSpan(const Context&, int row, const Span& span, RsPixelData
 }
 
 void RsMZBuffer::finalize() {
-    const std::size_t pixels = static_cast<std::size_t>(_width) * static_cast<std::size_t>(_height);
+    const std::size_t pixels = getPixelCount();
     const double* const second = _secondDepth.get();
     // Halved before adding: two lowest doubles would overflow their sum.
     for (std::size_t i = 0; i < pixels; ++i) _depth[i] = _depth[i] * 0.5 + second[i] * 0.5;
 }
 
 void RsMZBuffer::dump(std::ostream& os) const {
-    os << " _width: " << _width << " _height: " << _height << " _depth: " << static_cast<const void*>(_depth)
-       << " _secondDepth: " << static_cast<const void*>(_secondDepth.get());
+    RsDepthMapBuffer::dump(os);
+    os << " _secondDepth: " << static_cast<const void*>(_secondDepth.get());
 }
 
 }  // namespace Zr

@@ -10,7 +10,6 @@
 
 #include <OpenImageIO/deepdata.h>
 
-#include "rsSceneBuilder.h"
 #include "zrPassImages.h"
 #include "zrSampleScene.h"
 #include "zrTileRenderer.h"
@@ -24,21 +23,19 @@ struct Rendered {
 
 Rendered renderWithPasses(int threads, int width, int height) {
     // A deep sample is a layer laid "over" what lies behind; the sample scene's one material of
-    // the screen mode, which is not, is made normal here.
-    const RCShdPtr<SdScene> description = ZrSampleScene::makeDescription();
-    for (const RCShdPtr<SdInstance>& instance : description->getGeometry()) {
-        std::vector<RCShdPtr<const SdMaterial>> materials;
-        for (const RCShdPtr<const SdMaterial>& m : instance->getMaterials()) {
-            RCShdPtr<SdMaterial> copy = makeShared<SdMaterial>(*m);
-            copy->_transferMode = SdMaterial::TransferMode::normal;
-            materials.push_back(copy);
+    // the screen mode, which is not, is made normal here. Each thread has a description of its own.
+    const auto momentAt = [width, height](double) {
+        const RCShdPtr<SdScene> description = ZrSampleScene::makeDescription();
+        for (const RCShdPtr<SdInstance>& instance : description->getGeometry()) {
+            std::vector<RCShdPtr<const SdMaterial>> materials;
+            for (const RCShdPtr<const SdMaterial>& m : instance->getMaterials()) {
+                RCShdPtr<SdMaterial> copy = makeShared<SdMaterial>(*m);
+                copy->_transferMode = SdMaterial::TransferMode::normal;
+                materials.push_back(copy);
+            }
+            instance->setMaterials(materials);
         }
-        instance->setMaterials(materials);
-    }
-    const auto makeScene = [description] {
-        RCShdPtr<RsSceneBuilder> builder = makeShared<RsSceneBuilder>();
-        builder->addScene(description);
-        return builder->createRendererScene();
+        return ZrTileRenderer::momentOf(description, ZrSampleScene::makeCamera(width, height));
     };
     ZrPassImages passes(ZrPassImages::parse("z,n,p,uv,id"), true, width, height);
     ZrRenderSettings settings;
@@ -47,7 +44,7 @@ Rendered renderWithPasses(int threads, int width, int height) {
     settings.threads = threads;
     settings.passes = &passes;
     Rendered r;
-    r.picture = ZrTileRenderer::render(makeScene, ZrSampleScene::makeCamera(width, height), width, height, settings);
+    r.picture = ZrTileRenderer::render(momentAt, 0.0, width, height, settings);
     const std::string dir = ::testing::TempDir();
     const std::string layers = dir + "zrPasses" + std::to_string(threads) + ".exr";
     const std::string deep = dir + "zrDeep" + std::to_string(threads) + ".exr";

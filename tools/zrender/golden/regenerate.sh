@@ -18,6 +18,9 @@ golden="$root/tools/zrender/golden"
 # Antialiased, through a kernel of support 1 and one of support 2 (several regions each).
 "$build/tools/zrender" --size 160x120 --antialias --filter gaussian -o "$golden/sample-160x120-aa-gaussian.png"
 "$build/tools/zrender" --size 160x120 --antialias --filter cubic-bspline -o "$golden/sample-160x120-aa-cubic-bspline.png"
+# Motion blur (frame 6 at 24 frames a second: the sphere swings, the torus turns) and depth of field.
+"$build/tools/zrender" --size 160x120 --frames 6 --motion-blur --samples 6 -o "$golden/sample-160x120-motion-blur.png"
+"$build/tools/zrender" --size 160x120 --dof --aperture 0.5 --samples 8 -o "$golden/sample-160x120-dof.png"
 # Real model files from the assimp-testmodels package: OBJ with textures, glTF 2.0 and PLY.
 models=/usr/share/assimp/models
 "$build/tools/zrender" "$models/OBJ/spider.obj" --size 160x120 -o "$golden/model-spider-obj.png"
