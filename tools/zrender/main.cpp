@@ -105,7 +105,7 @@ int run(const ZrOptions& options) {
         if (passList != 0) ZrPassImages::writeExr(options.outputOfFrame(frame), passes.layers(picture));
         else if (options.compare.empty() || options.outputGiven)
             ZrImageFile::write(options.outputOfFrame(frame), picture, storage);
-        if (!options.deep.empty()) ZrPassImages::writeExr(options.deep, passes.deepImage());
+        if (!options.deep.empty()) ZrPassImages::writeExr(options.deepOfFrame(frame), passes.deepImage());
         if (!options.compare.empty()) {
             const ZrImageFile::Difference difference =
                 ZrImageFile::compare(picture, reference, options.tolerance);

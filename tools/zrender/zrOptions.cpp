@@ -170,6 +170,13 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
                                                                          : Rational(static_cast<int>(rate * 1000), 1000);
         if (o.frameCount() > 1 && o.output.find('#') == std::string::npos)
             throw CLI::ValidationError("--output", "needs a # pattern, such as out.####.png, for several frames");
+        if (!o.deep.empty() && o.frameCount() > 1 && o.deep.find('#') == std::string::npos)
+            throw CLI::ValidationError("--deep", "needs a # pattern, such as deep.####.exr, for several frames");
+        // The passes are gathered by single renders without antialiasing.
+        if ((!o.passes.empty() || !o.deep.empty()) &&
+            (o.antialiasing || o.accumulation.motionBlur || o.accumulation.depthOfField))
+            throw CLI::ValidationError(o.passes.empty() ? "--deep" : "--passes",
+                                       "comes from renders without --antialias, --motion-blur or --dof");
         if (!o.compare.empty() && o.frameCount() > 1)
             throw CLI::ValidationError("--compare", "compares one frame, not " + std::to_string(o.frameCount()));
     } catch (const CLI::CallForHelp& e) {
@@ -183,15 +190,15 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
     return -1;
 }
 
-std::string ZrOptions::outputOfFrame(int frame) const {
+std::string ZrOptions::fileOfFrame(const std::string& pattern, int frame) {
     std::string name;
-    for (std::size_t i = 0; i < output.size();) {
-        if (output[i] != '#') {
-            name += output[i++];
+    for (std::size_t i = 0; i < pattern.size();) {
+        if (pattern[i] != '#') {
+            name += pattern[i++];
             continue;
         }
         std::size_t run = 0;
-        while (i + run < output.size() && output[i + run] == '#') ++run;
+        while (i + run < pattern.size() && pattern[i + run] == '#') ++run;
         std::string number = std::to_string(frame);
         if (number.size() < run) number.insert(0, run - number.size(), '0');
         name += number;

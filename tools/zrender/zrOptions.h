@@ -48,7 +48,10 @@ struct ZrOptions {
 
     // The output file of the frame: each run of # replaced by the frame number, zero-padded to
     // the run's length.
-    std::string outputOfFrame(int frame) const;
+    std::string outputOfFrame(int frame) const { return fileOfFrame(output, frame); }
+    // The deep file of the frame, alike.
+    std::string deepOfFrame(int frame) const { return fileOfFrame(deep, frame); }
+    static std::string fileOfFrame(const std::string& pattern, int frame);
     int frameCount() const { return lastFrame - firstFrame + 1; }
 };
 
