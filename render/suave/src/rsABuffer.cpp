@@ -60,50 +60,13 @@ RsABuffer::RsABuffer(int x, int y, int width, int height, bool zBuffer, bool unp
       _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer), getPixelRegion()),
       _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer), getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
-    const std::size_t pixels = getPixelCount();
-    if (memory != nullptr && memory->_pool) {
-        _pool = std::move(memory->_pool);
-        _pool->rewind(static_cast<std::int32_t>(pixels));
-    } else {
-        // One fragment per pixel in the first chunk: a region without overlap needs no other.
-        _pool = std::make_unique<RsFragmentPool>(static_cast<std::int32_t>(pixels), sizeof(RsAFragment));
-        _pool->allocateChunk(pixels * sizeof(RsAFragment));
-    }
-    if (memory != nullptr && memory->_pixels >= pixels) {
-        _arrayPixels = memory->_pixels;
-        _lists = std::move(memory->_lists);
-        // Only the array of this buffer's mode: the other one's presence tells the mode.
-        if (zBuffer) _zBuffer = std::move(memory->_zBuffer);
-        else _closed = std::move(memory->_closed);
-    } else {
-        _arrayPixels = pixels;
-        _lists = std::make_unique_for_overwrite<RsAFragment*[]>(pixels);
-    }
-    std::fill(_lists.get(), _lists.get() + pixels, nullptr);
-    if (zBuffer) {
-        if (!_zBuffer) _zBuffer = std::make_unique_for_overwrite<double[]>(_arrayPixels);
-        std::fill(_zBuffer.get(), _zBuffer.get() + pixels, kEmptyDepth);
-    } else {
-        if (!_closed) _closed = std::make_unique_for_overwrite<std::uint16_t[]>(_arrayPixels);
-        std::fill(_closed.get(), _closed.get() + pixels, std::uint16_t(0));  // all open
-    }
+    acquire(getPixelCount(), zBuffer, kEmptyDepth, memory);
 }
 
 RsABuffer::~RsABuffer() {
-    if (_memory != nullptr) {
-        // The arrays and the pool go back for the next region's buffer.
-        _memory->_pixels = _arrayPixels;
-        _memory->_lists = std::move(_lists);
-        _memory->_zBuffer = std::move(_zBuffer);
-        _memory->_closed = std::move(_closed);
-        _memory->_pool = std::move(_pool);
-        return;
-    }
-    // The per-pixel arrays and the pool go first; the rasterizers and the guards follow as members.
-    _closed.reset();
-    _zBuffer.reset();
-    _lists.reset();
-    _pool.reset();
+    // The per-pixel arrays and the pool go back, or go first; the rasterizers and the guards follow
+    // as members.
+    release(_memory);
 }
 
 void RsABuffer::setOutput(const IxWriteGuard& output, const IxReadGuard& background, const Rgba& fillColor,
@@ -122,10 +85,7 @@ void RsABuffer::finalize() {
 }
 
 std::size_t RsABuffer::getMemorySize() const {
-    std::size_t bytes = sizeof(RsABuffer) + sizeof(RsFragmentPool) + _pool->getMemorySize();
-    if (_closed) bytes += _arrayPixels * sizeof(std::uint16_t);
-    if (_zBuffer) bytes += _arrayPixels * sizeof(double);
-    return bytes + _arrayPixels * sizeof(RsAFragment*);
+    return sizeof(RsABuffer) + getArrayBytes();
 }
 
 template <class Vertex, class Pixel>

@@ -32,7 +32,7 @@
 #include "rsAFragment.h"
 #include "rsDrawContext.h"
 #include "rsFilterKernel.h"
-#include "rsFragmentPool.h"
+#include "rsFragmentArrays.h"
 #include "rsPixelData.h"
 #include "rsPixelSpan.h"
 #include "rsRasterizer.h"
@@ -41,15 +41,9 @@
 namespace Zr {
 
 // What an A-buffer allocates, handed on from one region's buffer to the next.
-struct RsABufferMemory {
-    std::size_t _pixels = 0;  // the length of each per-pixel array
-    std::unique_ptr<std::uint16_t[]> _closed;
-    std::unique_ptr<double[]> _zBuffer;
-    std::unique_ptr<RsAFragment*[]> _lists;
-    std::unique_ptr<RsFragmentPool> _pool;
-};
+struct RsABufferMemory : RsFragmentArrays<RsAFragment, std::uint16_t> {};
 
-class RsABuffer : public RCObject, public IxTileManip {
+class RsABuffer : public RCObject, public IxTileManip, private RsFragmentArrays<RsAFragment, std::uint16_t> {
 public:
     using Rgba = CoRgbaColorTyped<float>;
     using Context = RsDrawContext;
@@ -149,12 +143,7 @@ private:
     WriteGuardNoCheck _output;
     Rgba _fillColor{0.0f, 0.0f, 0.0f, 1.0f};
     RsFilterKernel _kernel{RsFilterKernel::KernelBox};
-    std::unique_ptr<std::uint16_t[]> _closed;
-    std::unique_ptr<double[]> _zBuffer;
-    std::unique_ptr<RsAFragment*[]> _lists;
-    std::unique_ptr<RsFragmentPool> _pool;
     RsABufferMemory* _memory;
-    std::size_t _arrayPixels = 0;  // the length of the per-pixel arrays, at least the pixel count
     Rasterizer<RsTangentVertex> _rasterizerTangent;
     Rasterizer<RsNormalVertex> _rasterizerNormal;
     Rasterizer<RsPlainVertex> _rasterizerPlain;

@@ -2,13 +2,6 @@
 
 namespace Zr {
 
-namespace {
-// The fill colour of a new factory: no colour, full coverage.
-constexpr CoRgbaColorTyped<float> kOpaqueBlack(0.0f, 0.0f, 0.0f, 1.0f);
-}  // namespace
-
-RsABufferFactory::RsABufferFactory() : _fillColor(kOpaqueBlack) {}
-
 GeRectangle<int> RsABufferFactory::getPixelRegion() const {
     const GeRectangle<int>& r = _output._rectangle;
     const int s = _kernel.getKernelSupport();
@@ -22,20 +15,9 @@ RCShdPtr<RsABuffer> RsABufferFactory::createBuffer(const GeRectangle<int>& regio
     return buffer;
 }
 
-void RsABufferFactory::setOutput(const IxWriteGuard& output, bool accumulate, float weight) {
-    _output = output;
-    _accumulate = accumulate;
-    _weight = weight;
-}
-
 void RsABufferFactory::dump(std::ostream& os) const {
-    os << " _zBuffer: " << _zBuffer << " _output: ";
-    _output.dump(os);
-    os << " _accumulate: " << _accumulate << " _weight: " << _weight << " _fillColor: ";
-    _fillColor.dump(os);
-    os << " _background: ";
-    _background.dump(os);
-    os << " _unpremultiply: " << _unpremultiply << " _kernel:";
+    RsBufferOutputSettings::dump(os);
+    os << " _kernel:";
     _kernel.dump(os);
 }
 

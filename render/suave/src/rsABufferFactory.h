@@ -13,21 +13,20 @@
 #include "geRectangle.h"
 #include "ixTileManip.h"
 #include "rcShdPtr.h"
+#include "rsBufferOutputSettings.h"
 #include "rsABuffer.h"
 #include "rsFilterKernel.h"
 
 namespace Zr {
 
-class RsABufferFactory {
+class RsABufferFactory : public RsBufferOutputSettings {
 public:
     using Buffer = RsABuffer;
-    using Rgba = CoRgbaColorTyped<float>;
 
     static constexpr int kMaxArea = 8976;
 
-    // Depth test on, no output, not accumulating, weight 1, opaque black fill, no background,
-    // unpremultiplied output, the box kernel.
-    RsABufferFactory();
+    // The output settings' defaults and the box kernel.
+    RsABufferFactory() = default;
     RsABufferFactory(const RsABufferFactory&) = delete;
     RsABufferFactory& operator=(const RsABufferFactory&) = delete;
 
@@ -39,24 +38,9 @@ public:
     RCShdPtr<RsABuffer> createBuffer(const GeRectangle<int>& region) const;
 
     void setFilterKernel(const RsFilterKernel& kernel) { _kernel = kernel; }
-    void setUnpremultiply(bool unpremultiply) { _unpremultiply = unpremultiply; }
-    void setZBuffer(bool zBuffer) { _zBuffer = zBuffer; }
-    void setFillColor(const Rgba& fillColor) { _fillColor = fillColor; }
-    void setBackground(const IxReadGuard& background) { _background = background; }
-    // The output tile, whether the resolve adds to it instead of replacing it, and the weight of
-    // the finished pixels.
-    void setOutput(const IxWriteGuard& output, bool accumulate, float weight);
-
     void dump(std::ostream& os) const;
 
 private:
-    bool _zBuffer = true;
-    IxTileManip::WriteGuardNoCheck _output;
-    bool _accumulate = false;
-    float _weight = 1.0f;
-    Rgba _fillColor;
-    IxTileManip::ReadGuardNoCheck _background;
-    bool _unpremultiply = true;
     RsFilterKernel _kernel{RsFilterKernel::KernelBox};
     // Handed from each region's buffer to the next; the buffers die before the factory.
     mutable RsABufferMemory _memory;

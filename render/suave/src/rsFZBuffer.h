@@ -30,7 +30,7 @@
 #include "rcBase.h"
 #include "rsDrawContext.h"
 #include "rsFragment.h"
-#include "rsFragmentPool.h"
+#include "rsFragmentArrays.h"
 #include "rsPixelData.h"
 #include "rsPixelSpan.h"
 #include "rsRasterizer.h"
@@ -42,15 +42,9 @@ class RsAuxOutputs;
 class RsDeepShadowMap;
 
 // What a fragment buffer allocates, handed on from one buffer to the next.
-struct RsFZBufferMemory {
-    std::size_t _pixels = 0;  // the length of each per-pixel array
-    std::unique_ptr<unsigned char[]> _closed;
-    std::unique_ptr<double[]> _zBuffer;
-    std::unique_ptr<RsFragment*[]> _lists;
-    std::unique_ptr<RsFragmentPool> _pool;
-};
+struct RsFZBufferMemory : RsFragmentArrays<RsFragment, unsigned char> {};
 
-class RsFZBuffer : public RCObject, public IxTileManip {
+class RsFZBuffer : public RCObject, public IxTileManip, private RsFragmentArrays<RsFragment, unsigned char> {
 public:
     using Rgba = CoRgbaColorTyped<float>;
     using Context = RsDrawContext;
@@ -147,14 +141,9 @@ private:
     ReadGuardNoCheck _background;
     WriteGuardNoCheck _output;
     Rgba _fillColor{0.0f, 0.0f, 0.0f, 1.0f};
-    std::unique_ptr<unsigned char[]> _closed;
-    std::unique_ptr<double[]> _zBuffer;
-    std::unique_ptr<RsFragment*[]> _lists;
-    std::unique_ptr<RsFragmentPool> _pool;
     RsDeepShadowMap* _deepShadowMap = nullptr;
     RsAuxOutputs* _aux;
     RsFZBufferMemory* _memory;
-    std::size_t _arrayPixels = 0;  // the length of the per-pixel arrays, at least the pixel count
     Rasterizer<RsTangentVertex> _rasterizerTangent;
     Rasterizer<RsPlainVertex> _rasterizerPlain;
     Rasterizer<RsNormalVertex> _rasterizerNormal;

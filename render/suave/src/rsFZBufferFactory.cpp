@@ -4,13 +4,6 @@
 
 namespace Zr {
 
-namespace {
-// The fill colour of a new factory: no colour, full coverage.
-constexpr CoRgbaColorTyped<float> kOpaqueBlack(0.0f, 0.0f, 0.0f, 1.0f);
-}  // namespace
-
-RsFZBufferFactory::RsFZBufferFactory() : _fillColor(kOpaqueBlack) {}
-
 GeRectangle<int> RsFZBufferFactory::getPixelRegion() const {
     if (_deepShadowMap != nullptr) return getDeepShadowMapRegion();
     return _output._rectangle;
@@ -29,20 +22,9 @@ RCShdPtr<RsFZBuffer> RsFZBufferFactory::createBuffer(const GeRectangle<int>& reg
     return buffer;
 }
 
-void RsFZBufferFactory::setOutput(const IxWriteGuard& output, bool accumulate, float weight) {
-    _output = output;
-    _accumulate = accumulate;
-    _weight = weight;
-}
-
 void RsFZBufferFactory::dump(std::ostream& os) const {
-    os << " _zBuffer: " << _zBuffer << " _output: ";
-    _output.dump(os);
-    os << " _accumulate: " << _accumulate << " _weight: " << _weight << " _fillColor: ";
-    _fillColor.dump(os);
-    os << " _background: ";
-    _background.dump(os);
-    os << " _deepShadowMap: " << static_cast<const void*>(_deepShadowMap) << " _unpremultiply: " << _unpremultiply;
+    RsBufferOutputSettings::dump(os);
+    os << " _deepShadowMap: " << static_cast<const void*>(_deepShadowMap);
 }
 
 }  // namespace Zr

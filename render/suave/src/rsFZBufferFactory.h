@@ -11,22 +11,21 @@
 #include "geRectangle.h"
 #include "ixTileManip.h"
 #include "rcShdPtr.h"
+#include "rsBufferOutputSettings.h"
 #include "rsFZBuffer.h"
 
 namespace Zr {
 
 class RsDeepShadowMap;
 
-class RsFZBufferFactory {
+class RsFZBufferFactory : public RsBufferOutputSettings {
 public:
     using Buffer = RsFZBuffer;
-    using Rgba = CoRgbaColorTyped<float>;
 
     static constexpr int kMaxArea = 16384;
 
-    // Depth test on, no output, not accumulating, weight 1, opaque black fill, no background, no
-    // deep shadow map, unpremultiplied output.
-    RsFZBufferFactory();
+    // The output settings' defaults and no deep shadow map.
+    RsFZBufferFactory() = default;
     RsFZBufferFactory(const RsFZBufferFactory&) = delete;
     RsFZBufferFactory& operator=(const RsFZBufferFactory&) = delete;
 
@@ -38,13 +37,7 @@ public:
     // A buffer for the region, directed at the factory's output.
     RCShdPtr<RsFZBuffer> createBuffer(const GeRectangle<int>& region) const;
 
-    void setUnpremultiply(bool unpremultiply) { _unpremultiply = unpremultiply; }
-    void setZBuffer(bool zBuffer) { _zBuffer = zBuffer; }
-    void setFillColor(const Rgba& fillColor) { _fillColor = fillColor; }
-    void setBackground(const IxReadGuard& background) { _background = background; }
-    // The output tile, whether the resolve adds to it instead of replacing it, and the weight of
-    // the finished pixels.
-    void setOutput(const IxWriteGuard& output, bool accumulate, float weight);
+    using RsBufferOutputSettings::setOutput;
     void setOutput(RsDeepShadowMap& map) { _deepShadowMap = &map; }
     // Where the buffers hand their arrays and pool on, from region to region: memory that outlives
     // the factory carries them from one render to the next as well. Null for the factory's own.
@@ -53,26 +46,13 @@ public:
     void setAuxOutputs(RsAuxOutputs* aux) { _aux = aux; }
     RsAuxOutputs* getAuxOutputs() const { return _aux; }
 
-    bool getZBuffer() const { return _zBuffer; }
-    bool getUnpremultiply() const { return _unpremultiply; }
-    bool getAccumulate() const { return _accumulate; }
-    float getWeight() const { return _weight; }
-    const Rgba& getFillColor() const { return _fillColor; }
-
     void dump(std::ostream& os) const;
 
 private:
     // The square of the deep shadow map's size.
     GeRectangle<int> getDeepShadowMapRegion() const;
 
-    bool _zBuffer = true;
-    IxTileManip::WriteGuardNoCheck _output;
-    bool _accumulate = false;
-    float _weight = 1.0f;
-    Rgba _fillColor;
-    IxTileManip::ReadGuardNoCheck _background;
     RsDeepShadowMap* _deepShadowMap = nullptr;
-    bool _unpremultiply = true;
     // Handed from each region's buffer to the next; the buffers die before the factory.
     RsFZBufferMemory _ownMemory;
     RsFZBufferMemory* _memory = &_ownMemory;
