@@ -17,10 +17,10 @@ namespace {
 
 using namespace RsTest;
 
-// Two quads, s and t running along their edges U and V from Q, with texture coordinates (s, t):
-// at every pixel centre whose ray meets one well inside, the channels hold the intersection's
-// depth, world position, world normal (towards the eye), texture coordinates and IDs; where no
-// ray meets a quad they hold 0.
+// Two quads, s and t running along their edges U and V from Q, the first with texture coordinates
+// (s, t): at every pixel centre whose ray meets one well inside, the channels hold the
+// intersection's depth, world position, world normal (towards the eye), texture coordinates (0 for
+// the quad without them) and IDs; where no ray meets a quad they hold 0.
 TEST(RsAuxOutputs, SurfaceChannelsEqualTheRayIntersectionAtPixelCentres) {
     const int w = 48, h = 48;
     const GeRectangle<int> rect{0, w, 0, h};
@@ -41,8 +41,10 @@ TEST(RsAuxOutputs, SurfaceChannelsEqualTheRayIntersectionAtPixelCentres) {
             return GePoint3<float>(float(k.q.x + s * k.u.x + t * k.v.x), float(k.q.y + s * k.u.y + t * k.v.y),
                                    float(k.q.z + s * k.u.z + t * k.v.z));
         };
+        // Only the first quad has texture coordinates; the second's UV is 0.
+        const std::vector<GePoint3<float>> texCoords{{0, 0, 0}, {1, 0, 0}, {1, 1, 0}, {0, 1, 0}};
         instances.push_back(drawn(makeMesh({at(0, 0), at(1, 0), at(1, 1), at(0, 1)}, {0, 1, 2, 0, 2, 3},
-                                           {{0, 0, 0}, {1, 0, 0}, {1, 1, 0}, {0, 1, 0}}),
+                                           instances.empty() ? texCoords : std::vector<GePoint3<float>>{}),
                                   MaterialSettings()));
     }
     for (bool zBuffer : {true, false}) {
@@ -97,8 +99,8 @@ TEST(RsAuxOutputs, SurfaceChannelsEqualTheRayIntersectionAtPixelCentres) {
                 GeVector3<double> n = k.u.cross(k.v);
                 n = n * ((n.dot(d) < 0 ? 1.0 : -1.0) / n.length());
                 for (int c = 0; c < 3; ++c) EXPECT_NEAR(aux.getNormal()[3 * i + c], (&n.x)[c], 1e-5) << where;
-                EXPECT_NEAR(aux.getTexCoord()[2 * i], bs, 1e-4) << where;
-                EXPECT_NEAR(aux.getTexCoord()[2 * i + 1], bt, 1e-4) << where;
+                EXPECT_NEAR(aux.getTexCoord()[2 * i], found == 1 ? bs : 0.0, 1e-4) << where;
+                EXPECT_NEAR(aux.getTexCoord()[2 * i + 1], found == 1 ? bt : 0.0, 1e-4) << where;
                 EXPECT_EQ(aux.getObjectId()[i], float(found)) << where;
                 EXPECT_EQ(aux.getMaterialId()[i], float(found)) << where;
             }

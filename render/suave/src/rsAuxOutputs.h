@@ -12,7 +12,7 @@
 // at the pixel centre and unfiltered:
 //   Z          eye depth: the distance in front of the camera along its view axis;
 //   N, P       the interpolated normal (unit length) and the position, both in world space;
-//   UV         the first texture channel's coordinates;
+//   UV         the first texture channel's coordinates, 0 for a mesh without them;
 //   object ID  1 + the instance's index in the scene; material ID 1 + the index of its scene
 //              material among the scene's distinct materials in order of first use. Both are
 //              exact integers in floats.
@@ -112,8 +112,9 @@ public:
         } else {
             n[0] = n[1] = n[2] = 0.0f;
         }
-        _texCoord[2 * index] = static_cast<float>(data._texCoord._q.x * inv);
-        _texCoord[2 * index + 1] = static_cast<float>(data._texCoord._q.y * inv);
+        // A mesh without texture coordinates has none to give, whatever its faces are drawn with.
+        _texCoord[2 * index] = context._hasTexCoords ? static_cast<float>(data._texCoord._q.x * inv) : 0.0f;
+        _texCoord[2 * index + 1] = context._hasTexCoords ? static_cast<float>(data._texCoord._q.y * inv) : 0.0f;
         _objectId[index] = context._objectId;
         _materialId[index] = context._materialId;
     }

@@ -29,6 +29,8 @@ struct RsDrawContext {
     // The IDs of the instance and material being drawn, for renders with auxiliary outputs only.
     float _objectId = 0.0f;
     float _materialId = 0.0f;
+    // Whether the instance has texture coordinates of its own, which the UV channel holds.
+    bool _hasTexCoords = false;
 };
 
 }  // namespace Zr

@@ -74,7 +74,10 @@ public:
         _clipperDepth.setClipFlags(planes);
         _vertices = &vertices;
         if constexpr (kIds)
-            if (_aux != nullptr) _context._objectId = _aux->getObjectIdOf(geom);
+            if (_aux != nullptr) {
+                _context._objectId = _aux->getObjectIdOf(geom);
+                _context._hasTexCoords = vertices.hasTexCoords();
+            }
     }
 
     // Renders with auxiliary outputs: every face group is drawn with normals, and the drawing
