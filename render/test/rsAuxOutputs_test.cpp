@@ -112,7 +112,7 @@ TEST(RsAuxOutputs, SurfaceChannelsEqualTheRayIntersectionAtPixelCentres) {
 // holds the layers from the nearest down to the first opaque one with their depths and IDs, and
 // laid front to back it gives the picture. The view spans several regions, whose buffers reuse
 // one fragment pool; an instance out of view with two materials comes first, so that object and
-// material IDs differ.
+// material IDs differ; the layers are drawn with all three vertex kinds.
 TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePicture) {
     std::mt19937 rng(17);
     std::uniform_real_distribution<float> unit(0.0f, 1.0f);
@@ -143,8 +143,12 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
             layers.push_back({{x0, x1, y0, y1}, -z, Rgba(unit(rng), unit(rng), unit(rng), alpha),
                               float(layers.size() + 2)});
             const float l = float(x0 - w / 2), r = float(x1 - w / 2), b = float(y0 - h / 2), t = float(y1 - h / 2);
-            instances.push_back(drawn(makeMesh({{l, b, z}, {r, b, z}, {r, t, z}, {l, t, z}}, {0, 1, 2, 0, 2, 3}),
-                                      MaterialSettings(layers.back().colour)));
+            // The layers' materials take turns at the three vertex kinds.
+            constexpr unsigned kinds[3] = {0u, RsShadingContext::needsNormal, RsShadingContext::needsTangents};
+            MaterialSettings material(layers.back().colour);
+            material.needed = kinds[layers.size() % 3];
+            instances.push_back(
+                drawn(makeMesh({{l, b, z}, {r, b, z}, {r, t, z}, {l, t, z}}, {0, 1, 2, 0, 2, 3}), material));
         }
         const RCShdPtr<RsScene> scene = makeScene(instances);
         std::sort(layers.begin(), layers.end(), [](const Layer& a, const Layer& b) { return a.z < b.z; });
