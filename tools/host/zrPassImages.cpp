@@ -148,7 +148,7 @@ OIIO::ImageBuf ZrPassImages::deepImage() const {
                 const RsDeepSample* s = tile->getDeepSamples().data() + tile->getDeepOffsets()[i];
                 const std::int64_t pixel = pixelOf(x, y);
                 for (int k = 0; k < static_cast<int>(tile->getDeepCounts()[i]); ++k) {
-                    const float values[8] = {s[k]._r, s[k]._g,      s[k]._b,        s[k]._a,
+                    const float values[8] = {s[k]._r,      s[k]._g,     s[k]._b,        s[k]._a,
                                              s[k]._zFront, s[k]._zBack, s[k]._objectId, s[k]._materialId};
                     for (int c = 0; c < 8; ++c) deep.set_deep_value(pixel, c, k, values[c]);
                 }
