@@ -9,6 +9,8 @@
 // Light linking (see SdLight): an instance of a light carries its light number; an instance of a
 // geometry lists in its light table the numbers of the lights it names.
 #include <ostream>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include "geAffineMatrix3.h"
@@ -56,6 +58,11 @@ public:
     void setLightTable(std::vector<unsigned int> lights);
     void addLight(unsigned int lightNumber) { _lightTable.push_back(lightNumber); }
 
+    // The instance's name, as the host's scene calls it; the compositing passes name their IDs by
+    // it. Empty by default.
+    const std::string& getName() const { return _name; }
+    void setName(std::string name) { _name = std::move(name); }
+
     void dump(std::ostream& os) const;
 
 private:
@@ -65,6 +72,7 @@ private:
     SdInstanceAttributes _attributes;
     unsigned int _lightNumber = 0;
     std::vector<unsigned int> _lightTable;
+    std::string _name;
 };
 
 }  // namespace Zr

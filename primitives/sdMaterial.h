@@ -6,6 +6,7 @@
 // it makes the material's shaders.
 #include <cstdint>
 #include <ostream>
+#include <string>
 
 #include "coRgbColorTyped.h"
 #include "rcShdPtr.h"
@@ -90,6 +91,10 @@ public:
     RCShdPtr<const SdTextureParams> _refractionMap;
     RCShdPtr<const SdTextureParams> _irradianceMap;
     RCShdPtr<const SdTextureParams> _bumpMap;
+
+    // The material's name, as the host's scene calls it; the compositing passes name their IDs by
+    // it. May be empty.
+    std::string _name;
 };
 
 }  // namespace Zr

@@ -5,7 +5,8 @@ set -euo pipefail
 # libosmesa6-dev is optional: only the peer benchmark (zr_bench_peer) needs it, and the build
 # leaves that benchmark out where it is missing.
 packages=(g++ cmake ninja-build pkg-config libgtest-dev libgmock-dev libbenchmark-dev libosmesa6-dev
-          libassimp-dev libopenimageio-dev libcli11-dev libopenexr-dev openimageio-tools assimp-testmodels)
+          libassimp-dev libopenimageio-dev libcli11-dev libopenexr-dev openimageio-tools assimp-testmodels
+          libmurmurhash-dev)
 missing=()
 for p in "${packages[@]}"; do
   dpkg-query -W -f='${Status}' "$p" 2>/dev/null | grep -q "install ok installed" || missing+=("$p")

@@ -109,13 +109,16 @@ TEST(RsAuxOutputs, SurfaceChannelsEqualTheRayIntersectionAtPixelCentres) {
 }
 
 // Random quads of random opacity at distinct depths in a parallel view, with and without the
-// Z-buffer, with the default threshold and a lower one: the surface channels name the nearest
-// layer whose alpha reaches the threshold, the deep list holds the layers from the nearest down
-// to the first opaque one with their depths, and laid front to back it gives the picture.
+// Z-buffer, with the default threshold and a lower one, with and without the surface channels:
+// the surface channels name the nearest layer whose alpha reaches the threshold, the deep list
+// holds the layers from the nearest down to the first opaque one with their depths and IDs, and
+// laid front to back it gives the picture. The view spans several regions, whose buffers reuse
+// one fragment pool; an instance out of view with two materials comes first, so that object and
+// material IDs differ; the layers are drawn with all three vertex kinds.
 TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePicture) {
     std::mt19937 rng(17);
     std::uniform_real_distribution<float> unit(0.0f, 1.0f);
-    const int w = 32, h = 24;
+    const int w = 192, h = 96;
     const GeRectangle<int> rect{0, w, 0, h};
     const double n = 0.5, f = 20.0;
     const GeProjectiveMatrix3<double> parallel{2.0 / w, 0, 0, 0, 0, 2.0 / h, 0, 0, 0, 0, -2.0 / (f - n),
@@ -128,7 +131,9 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
             float id;
         };
         std::vector<Layer> layers;
-        std::vector<RCShdPtr<RsGeomInstance>> instances;
+        std::vector<RCShdPtr<RsGeomInstance>> instances{makeInstance(
+            makeMesh({{-1e3f, 0, -2}, {-999, 0, -2}, {-999, 1, -2}}, {0, 1, 2}), {}, {},
+            {makeShared<TestMaterial>(), makeShared<TestMaterial>()})};
         std::vector<float> depths;
         for (int i = 0; i < 7; ++i) depths.push_back(-1.0f - 0.75f * i);
         std::shuffle(depths.begin(), depths.end(), rng);
@@ -138,16 +143,21 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
             // Opaque layers of alpha 1 and of alpha one ulp below, which counts as one.
             const float alpha = rng() % 3 == 0 ? (rng() % 2 ? 1.0f : 0.99999994f) : 0.1f + 0.8f * unit(rng);
             layers.push_back({{x0, x1, y0, y1}, -z, Rgba(unit(rng), unit(rng), unit(rng), alpha),
-                              float(layers.size() + 1)});
+                              float(layers.size() + 2)});
             const float l = float(x0 - w / 2), r = float(x1 - w / 2), b = float(y0 - h / 2), t = float(y1 - h / 2);
-            instances.push_back(drawn(makeMesh({{l, b, z}, {r, b, z}, {r, t, z}, {l, t, z}}, {0, 1, 2, 0, 2, 3}),
-                                      MaterialSettings(layers.back().colour)));
+            // The layers' materials take turns at the three vertex kinds.
+            constexpr unsigned kinds[3] = {0u, RsShadingContext::needsNormal, RsShadingContext::needsTangents};
+            MaterialSettings material(layers.back().colour);
+            material.needed = kinds[layers.size() % 3];
+            instances.push_back(
+                drawn(makeMesh({{l, b, z}, {r, b, z}, {r, t, z}, {l, t, z}}, {0, 1, 2, 0, 2, 3}), material));
         }
         const RCShdPtr<RsScene> scene = makeScene(instances);
         std::sort(layers.begin(), layers.end(), [](const Layer& a, const Layer& b) { return a.z < b.z; });
         const bool zBuffer = trial % 2 == 0;
         const float threshold = trial % 4 < 2 ? 1.0f : 0.5f;
-        RsAuxOutputs aux(rect, true, true);
+        const bool surface = trial % 3 != 2;
+        RsAuxOutputs aux(rect, surface, true);
         aux.setOpacityThreshold(threshold);
         RsRenderer renderer;
         renderer.setZBuffer(zBuffer);
@@ -172,13 +182,17 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
                     if (front == nullptr && (opaque || l.colour.a >= threshold)) front = &l;
                     if (opaque) break;
                 }
-                EXPECT_EQ(aux.getObjectId()[i], front ? front->id : 0.0f) << where;
-                EXPECT_NEAR(aux.getZ()[i], front ? front->z : 0.0f, 1e-5f) << where;
+                if (surface) {
+                    EXPECT_EQ(aux.getObjectId()[i], front ? front->id : 0.0f) << where;
+                    EXPECT_NEAR(aux.getZ()[i], front ? front->z : 0.0f, 1e-5f) << where;
+                }
                 ASSERT_EQ(aux.getDeepCounts()[i], visible.size()) << where;
                 const RsDeepSample* samples = aux.getDeepSamples().data() + aux.getDeepOffsets()[i];
                 for (std::size_t s = 0; s < visible.size(); ++s) {
                     EXPECT_NEAR(samples[s]._zFront, visible[s]->z, 1e-4) << where;
                     EXPECT_EQ(samples[s]._zBack, samples[s]._zFront) << where;
+                    EXPECT_EQ(samples[s]._objectId, visible[s]->id) << where;
+                    EXPECT_EQ(samples[s]._materialId, visible[s]->id + 1.0f) << where;
                 }
                 const Rgba flat = flattenFrontToBack(&samples->_r, visible.size(), sizeof(RsDeepSample) / sizeof(float));
                 expectNearRgba(flat, premultiplied(picture.at(x, y)), 1e-5, where);

@@ -257,6 +257,7 @@ RCShdPtr<const SdMaterial> ZrModelFile::Model::makeMaterial(const aiMaterial& so
     float exponent = 0.0f;
     if (source.Get(AI_MATKEY_SHININESS, exponent) == AI_SUCCESS) material->_shininess = shininessOfExponent(exponent);
     material->_diffuseMap = readDiffuseMap(source);
+    material->_name = source.GetName().C_Str();
     return material;
 }
 
@@ -349,6 +350,7 @@ RCShdPtr<SdScene> ZrModelFile::sceneAt(double seconds, const ZrShadowOptions& sh
                 makeShared<SdMeshGeometry>(model.meshes[m]), GeAffineMatrix3<float>(toAffine(matrix)));
             instance->setMaterials(
                 {materialIndex < model.materials.size() ? model.materials[materialIndex] : fallbackMaterial});
+            instance->setName(node->mName.C_Str());
             scene->addGeometry(std::move(instance));
         }
     }

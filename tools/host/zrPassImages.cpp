@@ -5,6 +5,7 @@
 #include <OpenImageIO/deepdata.h>
 #include <OpenImageIO/imagebufalgo.h>
 
+#include "zrCryptomatte.h"
 #include "zrHostError.h"
 
 namespace Zr {
@@ -41,7 +42,8 @@ unsigned ZrPassImages::parse(const std::string& list) {
         else if (name == "p") passes |= position;
         else if (name == "uv") passes |= texCoord;
         else if (name == "id") passes |= ids;
-        else throw ZrHostError("--passes: no pass named '" + name + "' (z, n, p, uv, id)");
+        else if (name == "crypto") passes |= crypto;
+        else throw ZrHostError("--passes: no pass named '" + name + "' (z, n, p, uv, id, crypto)");
     }
     return passes;
 }
@@ -51,7 +53,7 @@ ZrPassImages::ZrPassImages(unsigned passes, bool deep, int width, int height)
 
 std::unique_ptr<RsAuxOutputs> ZrPassImages::makeTileOutputs(const GeRectangle<int>& tile) const {
     if (_passes == 0 && !_deep) return nullptr;
-    return std::make_unique<RsAuxOutputs>(tile, _passes != 0, _deep);
+    return std::make_unique<RsAuxOutputs>(tile, (_passes & ~unsigned(crypto)) != 0, _deep || (_passes & crypto) != 0);
 }
 
 void ZrPassImages::keepTile(std::unique_ptr<RsAuxOutputs> outputs) {
@@ -67,11 +69,26 @@ OIIO::ImageBuf ZrPassImages::layers(const OIIO::ImageBuf& picture) const {
             wanted.push_back(&p);
             names.insert(names.end(), p.names.begin(), p.names.end());
         }
+    // The ID mattes come last; every tile's scene names the IDs alike.
+    std::vector<ZrCryptomatte> mattes;
+    if ((_passes & crypto) != 0) {
+        const RsAuxOutputs* any = _tiles.empty() ? nullptr : _tiles.front().get();
+        const std::vector<std::string> none;
+        mattes.emplace_back("CryptoObject", "object", any ? any->getObjectNames() : none, &RsDeepSample::_objectId);
+        mattes.emplace_back("CryptoMaterial", "material", any ? any->getMaterialNames() : none,
+                            &RsDeepSample::_materialId);
+        for (const ZrCryptomatte& matte : mattes) {
+            const std::vector<std::string> channels = matte.channelNames();
+            names.insert(names.end(), channels.begin(), channels.end());
+        }
+    }
+    const int firstMatte = static_cast<int>(names.size()) - static_cast<int>(mattes.size()) * ZrCryptomatte::kChannels;
     const int channels = static_cast<int>(names.size());
     OIIO::ImageSpec spec(_width, _height, channels, OIIO::TypeDesc::FLOAT);
     spec.channelnames = names;
     spec.alpha_channel = 3;
     spec.z_channel = (_passes & depth) != 0 ? 4 : -1;
+    for (const ZrCryptomatte& matte : mattes) matte.describe(spec);
     OIIO::ImageBuf image(spec);
     OIIO::ImageBufAlgo::paste(image, 0, 0, 0, 0, picture);
     std::vector<float> row;
@@ -88,13 +105,28 @@ OIIO::ImageBuf ZrPassImages::layers(const OIIO::ImageBuf& picture) const {
             }
             first += count;
         }
+        if (mattes.empty()) continue;
+        for (int y = r.y0; y < r.y1; ++y) {
+            row.resize(std::size_t(r.x1 - r.x0) * mattes.size() * ZrCryptomatte::kChannels);
+            float* values = row.data();
+            for (int x = r.x0; x < r.x1; ++x) {
+                const std::size_t i = tile->indexOf(x, y);
+                const RsDeepSample* samples = tile->getDeepSamples().data() + tile->getDeepOffsets()[i];
+                for (ZrCryptomatte& matte : mattes) {
+                    matte.pixel(samples, tile->getDeepCounts()[i], values);
+                    values += ZrCryptomatte::kChannels;
+                }
+            }
+            const OIIO::ROI roi(r.x0, r.x1, _height - 1 - y, _height - y, 0, 1, firstMatte, channels);
+            image.set_pixels(roi, OIIO::TypeDesc::FLOAT, row.data());
+        }
     }
     return image;
 }
 
 OIIO::ImageBuf ZrPassImages::deepImage() const {
-    OIIO::ImageSpec spec(_width, _height, 6, OIIO::TypeDesc::FLOAT);
-    spec.channelnames = {"R", "G", "B", "A", "Z", "ZBack"};
+    OIIO::ImageSpec spec(_width, _height, 8, OIIO::TypeDesc::FLOAT);
+    spec.channelnames = {"R", "G", "B", "A", "Z", "ZBack", "ObjectID", "MaterialID"};
     spec.alpha_channel = 3;
     spec.z_channel = 4;
     spec.deep = true;
@@ -116,8 +148,9 @@ OIIO::ImageBuf ZrPassImages::deepImage() const {
                 const RsDeepSample* s = tile->getDeepSamples().data() + tile->getDeepOffsets()[i];
                 const std::int64_t pixel = pixelOf(x, y);
                 for (int k = 0; k < static_cast<int>(tile->getDeepCounts()[i]); ++k) {
-                    const float values[6] = {s[k]._r, s[k]._g, s[k]._b, s[k]._a, s[k]._zFront, s[k]._zBack};
-                    for (int c = 0; c < 6; ++c) deep.set_deep_value(pixel, c, k, values[c]);
+                    const float values[8] = {s[k]._r,      s[k]._g,     s[k]._b,        s[k]._a,
+                                             s[k]._zFront, s[k]._zBack, s[k]._objectId, s[k]._materialId};
+                    for (int c = 0; c < 8; ++c) deep.set_deep_value(pixel, c, k, values[c]);
                 }
             }
     }

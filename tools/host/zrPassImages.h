@@ -8,9 +8,11 @@
 //   ZrPassImages::writeExr("deep.exr", passes.deepImage());
 //
 // The layered image holds the picture's R, G, B, A and then, in this order, Z; N.X, N.Y, N.Z;
-// P.X, P.Y, P.Z; UV.U, UV.V; ObjectID, MaterialID for the passes asked for. The deep image holds
-// per pixel every fragment, nearest first, as R, G, B, A (premultiplied), Z and ZBack. Rows run
-// from the top down, as in the pictures.
+// P.X, P.Y, P.Z; UV.U, UV.V; ObjectID, MaterialID for the passes asked for; then for crypto the
+// ID mattes by object and by material name (zrCryptomatte.h), made from the deep samples, which
+// the tiles then gather even without a deep image. The deep image holds per pixel every fragment,
+// nearest first, as R, G, B, A (premultiplied), Z, ZBack, ObjectID and MaterialID. Rows run from
+// the top down, as in the pictures.
 #include <memory>
 #include <mutex>
 #include <string>
@@ -25,10 +27,10 @@ namespace Zr {
 
 class ZrPassImages {
 public:
-    enum Pass : unsigned { depth = 0x1, normal = 0x2, position = 0x4, texCoord = 0x8, ids = 0x10 };
+    enum Pass : unsigned { depth = 0x1, normal = 0x2, position = 0x4, texCoord = 0x8, ids = 0x10, crypto = 0x20 };
 
-    // The passes of a comma-separated list of z, n, p, uv and id. Throws ZrHostError for any
-    // other name.
+    // The passes of a comma-separated list of z, n, p, uv, id and crypto. Throws ZrHostError for
+    // any other name.
     static unsigned parse(const std::string& list);
 
     ZrPassImages(unsigned passes, bool deep, int width, int height);

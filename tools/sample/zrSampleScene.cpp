@@ -44,11 +44,18 @@ RCShdPtr<const SdTextureParams> tileMap() {
     return makeShared<SdTextureParams>(makeShared<SdTexture>(size, size, std::move(texels)));
 }
 
-RCShdPtr<SdInstance> placed(const RCShdPtr<const SdMesh>& mesh, std::vector<RCShdPtr<const SdMaterial>> materials,
+RCShdPtr<SdInstance> placed(const char* name, const RCShdPtr<const SdMesh>& mesh,
+                            std::vector<RCShdPtr<const SdMaterial>> materials,
                             const GeAffineMatrix3<float>& objectToWorld) {
     RCShdPtr<SdInstance> instance = makeShared<SdInstance>(makeShared<SdMeshGeometry>(mesh), objectToWorld);
     instance->setMaterials(std::move(materials));
+    instance->setName(name);
     return instance;
+}
+
+RCShdPtr<SdMaterial> named(const char* name, RCShdPtr<SdMaterial> material) {
+    material->_name = name;
+    return material;
 }
 
 RCShdPtr<SdStdLight> light(SdStdLight::Kind kind, const Colour& colour, float intensity) {
@@ -74,40 +81,42 @@ RCShdPtr<SdScene> ZrSampleScene::makeDescription(const Options& options, double 
 
     // Ground: a board of 8 by 8 cells, 12 units wide; its two face groups take the two materials
     // in turn. The light cells are tiles of a map, the dark ones slightly glossy.
-    RCShdPtr<SdMaterial> lightCells = standard({0.85f, 0.82f, 0.74f}, {0.1f, 0.1f, 0.1f}, 0.3f);
+    RCShdPtr<SdMaterial> lightCells = named("lightCells", standard({0.85f, 0.82f, 0.74f}, {0.1f, 0.1f, 0.1f}, 0.3f));
     lightCells->_diffuseMap = tileMap();
-    scene->addGeometry(placed(ZrShapes::makeGrid(12.0f, 8, true),
-                              {lightCells, standard({0.30f, 0.33f, 0.38f}, {0.35f, 0.35f, 0.35f}, 0.5f)},
+    RCShdPtr<SdMaterial> darkCells = named("darkCells", standard({0.30f, 0.33f, 0.38f}, {0.35f, 0.35f, 0.35f}, 0.5f));
+    scene->addGeometry(placed("ground", ZrShapes::makeGrid(12.0f, 8, true), {lightCells, darkCells},
                               ZrSceneKit::makePlacement({0, 0, 0})));
 
     // An opaque red sphere on the left, with a sharp highlight, swinging left and right once in
     // two seconds (about 2.5 units a second through the middle).
-    scene->addGeometry(placed(ZrShapes::makeSphere(1.0f, 32, 16),
-                              {standard({0.85f, 0.18f, 0.12f}, {0.8f, 0.8f, 0.8f}, 0.6f)},
+    scene->addGeometry(placed("redSphere", ZrShapes::makeSphere(1.0f, 32, 16),
+                              {named("redGloss", standard({0.85f, 0.18f, 0.12f}, {0.8f, 0.8f, 0.8f}, 0.6f))},
                               ZrSceneKit::makePlacement({-1.7 + 0.8 * std::sin(3.14159265358979323846 * seconds),
                                                          1.0, 0.0})));
 
     // A green torus standing on its rim on the right, turned towards the camera, half transparent,
     // in the host's own material.
-    RCShdPtr<SdMaterial> torus = makeShared<ZrDiffuseMaterial>();
+    RCShdPtr<SdMaterial> torus = named("greenDiffuse", makeShared<ZrDiffuseMaterial>());
     torus->_diffuse = {0.15f, 0.80f, 0.30f};
     torus->_opacity = 0.55f;
-    scene->addGeometry(placed(ZrShapes::makeTorus(0.85f, 0.3f, 40, 16), {torus},
+    scene->addGeometry(placed("greenTorus", ZrShapes::makeTorus(0.85f, 0.3f, 40, 16), {torus},
                               ZrSceneKit::makePlacement({1.7, 1.15, 0.2}, {1.0, -0.35, 0.0}, 80.0 + 180.0 * seconds)));
 
     // A blue cube in front, turned about the vertical, half clear and laid over the scene in the
     // screen mode; its shadow in deep maps is blue.
-    scene->addGeometry(placed(ZrShapes::makeCube(0.6f),
-                              {standard({0.25f, 0.45f, 0.95f}, {0.5f, 0.5f, 0.5f}, 0.4f, 0.5f, Mode::screen)},
+    RCShdPtr<SdMaterial> cube =
+        named("blueScreen", standard({0.25f, 0.45f, 0.95f}, {0.5f, 0.5f, 0.5f}, 0.4f, 0.5f, Mode::screen));
+    scene->addGeometry(placed("blueCube", ZrShapes::makeCube(0.6f), {cube},
                               ZrSceneKit::makePlacement({0.1, 0.6, 2.0}, {0, 1, 0}, 30.0)));
 
     // A coarse yellow sphere at the back, drawn as flat wires one and a half pixels wide.
-    RCShdPtr<SdMaterial> wires = ZrSceneKit::makeMaterial({1.0f, 0.85f, 0.2f});
+    RCShdPtr<SdMaterial> wires = named("yellowWires", ZrSceneKit::makeMaterial({1.0f, 0.85f, 0.2f}));
     wires->_shadingModel = SdMaterial::ShadingModel::noShade;
     wires->_wireframe = true;
     wires->_screenSpace = true;
     wires->_wireSize = 1.5f;
-    scene->addGeometry(placed(ZrShapes::makeSphere(0.9f, 12, 7), {wires}, ZrSceneKit::makePlacement({0.2, 0.9, -2.2})));
+    scene->addGeometry(
+        placed("wireSphere", ZrShapes::makeSphere(0.9f, 12, 7), {wires}, ZrSceneKit::makePlacement({0.2, 0.9, -2.2})));
 
     // A warm omni light above the left, a spot from the front right aimed at the middle, and a
     // weak cool direct light from above that also lights the materials' ambient term.

@@ -2,8 +2,10 @@
 
 #include <algorithm>
 #include <cmath>
+#include <functional>
 
 #include "rsFZBuffer.h"
+#include "rsFZBufferFactory.h"
 #include "rsGeomInstance.h"
 #include "rsMaterialShader.h"
 
@@ -36,6 +38,9 @@ void RsAuxOutputs::begin(const RsScene& scene, const GeAffineMatrix3<float>& wor
     _deepOffsets.assign(_deep ? pixels : 0, 0);
     _deepCounts.assign(_deep ? pixels : 0, 0);
     _deepSamples.clear();
+    _fragmentIds.clear();
+    // Room for one fragment per pixel of a region, so that the span methods seldom grow it.
+    if (_deep) _fragmentIds.reserve(std::min<std::size_t>(pixels, RsFZBufferFactory::kMaxArea));
 
     _worldToCamera = worldToCamera;
     _cameraToWorld = worldToCamera.computeInverse();
@@ -46,13 +51,17 @@ void RsAuxOutputs::begin(const RsScene& scene, const GeAffineMatrix3<float>& wor
 
     _objectIds.clear();
     _materialIds.clear();
+    _objectNames.clear();
+    _materialNames.clear();
     float object = 0.0f;
     for (const RCShdPtr<RsGeomInstance>& instance : scene._geomInstances) {
         const RsGeomInstance& geom = *instance;
         _objectIds.emplace(&geom, object += 1.0f);
+        _objectNames.push_back(geom._name);
         for (const RCShdPtr<RsMaterialShader>& material : geom._materials) {
             const SdMaterial* key = material->getMaterial().get();
-            _materialIds.emplace(key, static_cast<float>(_materialIds.size() + 1));
+            if (_materialIds.emplace(key, static_cast<float>(_materialIds.size() + 1)).second)
+                _materialNames.push_back(key != nullptr ? key->_name : std::string());
         }
     }
 }
@@ -89,6 +98,11 @@ void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
         }
     }
     if (_deep) {
+        // The IDs of a fragment are found by its address among those the buffer made.
+        const auto before = [](const FragmentIds& a, const FragmentIds& b) {
+            return std::less<const RsFragment*>()(a.fragment, b.fragment);
+        };
+        std::sort(_fragmentIds.begin(), _fragmentIds.end(), before);
         RsFragment* const* lists = buffer.getLists();
         std::vector<const RsFragment*> nearFirst;
         for (int row = 0; row < height; ++row) {
@@ -107,10 +121,15 @@ void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
                     CoRgbaColorTyped<float> alone(0.0f, 0.0f, 0.0f, 1.0f);
                     fragment._transfer(fragment._color, CoRgbaColorTyped<float>(0.0f, 0.0f, 0.0f, 0.0f), alone);
                     const float z = eyeDepthOf(fragment._depth);
-                    _deepSamples.push_back({z, z, alone.r, alone.g, alone.b, alone.a});
+                    const auto ids = std::lower_bound(_fragmentIds.begin(), _fragmentIds.end(),
+                                                      FragmentIds{&fragment, 0.0f, 0.0f}, before);
+                    const bool known = ids != _fragmentIds.end() && ids->fragment == &fragment;
+                    _deepSamples.push_back({z, z, alone.r, alone.g, alone.b, alone.a, known ? ids->objectId : 0.0f,
+                                            known ? ids->materialId : 0.0f});
                 }
             }
         }
+        _fragmentIds.clear();
     }
 }
 

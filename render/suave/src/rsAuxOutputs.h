@@ -19,8 +19,9 @@
 // A pixel without such a fragment holds 0 in every channel.
 //
 // Deep samples are every fragment of a pixel, nearest first: front and back depth (equal, as a
-// fragment is a surface point) and the colour that the fragment's transfer function lays over
-// transparent black, which for the normal mode is its premultiplied colour.
+// fragment is a surface point), the colour that the fragment's transfer function lays over
+// transparent black, which for the normal mode is its premultiplied colour, and the object and
+// material IDs of the fragment, numbered as in the surface channels.
 //
 // Only the path without antialiasing gathers them; a render on the antialiased path leaves them
 // as begin made them. The channels cost nothing to a renderer that has no RsAuxOutputs: its
@@ -42,11 +43,14 @@
 namespace Zr {
 
 class RsFZBuffer;
+struct RsFragment;
 
 struct RsDeepSample {
     float _zFront;
     float _zBack;
     float _r, _g, _b, _a;  // premultiplied
+    float _objectId;
+    float _materialId;
 };
 
 class RsAuxOutputs {
@@ -80,6 +84,10 @@ public:
     // The IDs of this scene, as the channels hold them; 0 for what the scene does not hold.
     float getObjectIdOf(const RsGeomInstance& instance) const;
     float getMaterialIdOf(const RsMaterialShader& material) const;
+    // The name of each ID, from 1 on (entry 0 names ID 1): the instances' and the materials'
+    // names, empty where the scene gives none. Set by begin.
+    const std::vector<std::string>& getObjectNames() const { return _objectNames; }
+    const std::vector<std::string>& getMaterialNames() const { return _materialNames; }
 
     // ---- For the renderer ----
     // Clears every channel for a render of scene through the view.
@@ -94,7 +102,7 @@ public:
     template <class Vertex>
     void record(std::size_t index, double depth, float alpha, bool byDepth, const RsPixelData<Vertex>& data,
                 const RsDrawContext& context) {
-        if (alpha < _minAlpha) return;
+        if (!_surface || alpha < _minAlpha) return;
         double& kept = _nearest[index];
         if (byDepth ? !(depth < kept) : kept != kNone) return;
         kept = depth;
@@ -117,6 +125,10 @@ public:
         _texCoord[2 * index + 1] = context._hasTexCoords ? static_cast<float>(data._texCoord._q.y * inv) : 0.0f;
         _objectId[index] = context._objectId;
         _materialId[index] = context._materialId;
+    }
+    // Keeps the IDs of a fragment just made in the buffer being drawn, for its deep sample.
+    void recordIds(const RsFragment* fragment, const RsDrawContext& context) {
+        if (_deep) _fragmentIds.push_back({fragment, context._objectId, context._materialId});
     }
     // Finishes the pixels of a drawn buffer: the surface channels from eye to world space, and
     // the deep samples of its fragment lists.
@@ -142,6 +154,16 @@ private:
     double _a = 0.0, _b = 0.0, _c = 0.0, _e = 1.0;
     std::unordered_map<const RsGeomInstance*, float> _objectIds;
     std::unordered_map<const SdMaterial*, float> _materialIds;
+    std::vector<std::string> _objectNames, _materialNames;
+    // The IDs of the fragments that the buffer being drawn has made, in the order made; a
+    // fragment's record stands for it until the next buffer's pool hands the record out again,
+    // so finishRegion empties the list.
+    struct FragmentIds {
+        const RsFragment* fragment;
+        float objectId;
+        float materialId;
+    };
+    std::vector<FragmentIds> _fragmentIds;
 };
 
 }  // namespace Zr

@@ -32,12 +32,9 @@ RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool u
       _unpremultiply(unpremultiply),
       _aux(aux != nullptr && (aux->hasSurface() || aux->hasDeep()) ? aux : nullptr),
       _memory(memory),
-      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer, _aux != nullptr && _aux->hasSurface()),
-                         getPixelRegion()),
-      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer, _aux != nullptr && _aux->hasSurface()),
-                       getPixelRegion()),
-      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer, _aux != nullptr && _aux->hasSurface()),
-                        getPixelRegion()) {
+      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer, _aux != nullptr), getPixelRegion()),
+      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer, _aux != nullptr), getPixelRegion()),
+      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer, _aux != nullptr), getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
     ZR_ASSERT_AT(_aux == nullptr || width == 0 || height == 0 ||
                      (_aux->getRegion().contains(x, y) && _aux->getRegion().contains(x + width - 1, y + height - 1)),
@@ -97,8 +94,10 @@ void RsFZBuffer::drawSpanNoZ(const Context& context, int row, const Span& span, 
     for (int x = span._x1; x < span._x2; ++x) {
         if (closed[x] == 0) {
             RsFragment* fragment = makeFragment(context, data);
-            if constexpr (kAux)
+            if constexpr (kAux) {
+                _aux->recordIds(fragment, context);
                 _aux->record(auxRow + std::size_t(x), fragment->_depth, fragment->_color.a, false, data, context);
+            }
             // The drawing order alone decides: the last drawn lies farthest.
             fragment->_next = lists[x];
             lists[x] = fragment;
@@ -121,7 +120,10 @@ void RsFZBuffer::drawSpanZ(const Context& context, int row, const Span& span, Rs
         if (nearest[x] > data._z._q) {
             RsFragment* fragment = makeFragment(context, data);
             const double depth = fragment->_depth;
-            if constexpr (kAux) _aux->record(auxRow + std::size_t(x), depth, fragment->_color.a, true, data, context);
+            if constexpr (kAux) {
+                _aux->recordIds(fragment, context);
+                _aux->record(auxRow + std::size_t(x), depth, fragment->_color.a, true, data, context);
+            }
             const bool opaque = context._canBeOpaque && RsTolerance::isOne(fragment->_color.a);
             RsFragment* const head = lists[x];
             if (head == nullptr || depth >= head->_depth) {

@@ -108,8 +108,8 @@ public:
 
     // The span methods, for the pixels [span._x1, span._x2) of region-relative row `row`, with the
     // pixel data placed at the first of them: with and without Z. Defined for the three vertex
-    // kinds of the rasterizers. With kAux the front-most fragments are also recorded in the
-    // auxiliary outputs.
+    // kinds of the rasterizers. With kAux the front-most fragments and the IDs of every fragment
+    // are also recorded in the auxiliary outputs.
     template <class Vertex, bool kAux = false>
     void drawSpanZ(const Context& context, int row, const Span& span, RsPixelData<Vertex>& data);
     template <class Vertex, bool kAux = false>

@@ -80,9 +80,12 @@ public:
             }
     }
 
-    // Renders with auxiliary outputs: every face group is drawn with normals, and the drawing
-    // context carries the IDs of instance and material.
-    void setAuxOutputs(const RsAuxOutputs* aux) { _aux = aux != nullptr && aux->hasSurface() ? aux : nullptr; }
+    // Renders with auxiliary outputs: the drawing context carries the IDs of instance and
+    // material, and for the surface channels every face group is drawn with normals.
+    void setAuxOutputs(const RsAuxOutputs* aux) {
+        _aux = aux != nullptr && (aux->hasSurface() || aux->hasDeep()) ? aux : nullptr;
+        _surfaceAux = _aux != nullptr && _aux->hasSurface();
+    }
 
     // Draws faces firstFace up to but not including endFace (both clamped to the mesh) with the
     // material, which is locked in memory meanwhile.
@@ -105,10 +108,10 @@ public:
 
         const unsigned int needed = shader.getNeededContext();
         // The auxiliary outputs read the eye position and texture coordinates of every fragment.
-        _context._needed = _aux != nullptr ? needed | RsShadingContext::needsEyeCoord | RsShadingContext::needsTexCoord
+        _context._needed = _surfaceAux ? needed | RsShadingContext::needsEyeCoord | RsShadingContext::needsTexCoord
                                            : needed;
         const bool tangents = (needed & RsShadingContext::needsTangents) != 0;
-        const bool normals = (needed & RsShadingContext::needsNormal) != 0 || _aux != nullptr;
+        const bool normals = (needed & RsShadingContext::needsNormal) != 0 || _surfaceAux;
         if constexpr (kIds)
             if (_aux != nullptr) _context._materialId = _aux->getMaterialIdOf(shader);
         if (tangents) _vertices->prepareTangents();
@@ -303,6 +306,7 @@ private:
     Context _context;
     RCShdPtr<RsMaterialShader> _material;
     const RsAuxOutputs* _aux = nullptr;
+    bool _surfaceAux = false;
 };
 
 }  // namespace Zr

@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <ostream>
 #include <set>
+#include <string>
 #include <vector>
 
 #include "geAffineMatrix3.h"
@@ -74,6 +75,9 @@ public:
 
     // The numbers of the lights linked to the instance, each once.
     LightSet _lights;
+
+    // The name of the scene description's instance, for the passes that name objects.
+    std::string _name;
 
     // Written by each render call for the instances it considers: object to camera space, the
     // box in camera space, and the frustum planes that the box crosses.

@@ -100,6 +100,7 @@ RCShdPtr<RsGeomInstance> RsSceneBuilder::add(const RCShdPtr<const SdInstance>& i
 
     RCShdPtr<RsGeomInstance> geomInstance = makeShared<RsGeomInstance>(
         instance->getMatrix(), mesh, shaders, shadowShaders, instance->getAttributes(), instance->getLightTable());
+    geomInstance->_name = instance->getName();
     _geomInstances.push_back(geomInstance);
     return geomInstance;
 }
