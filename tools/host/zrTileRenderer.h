@@ -16,6 +16,10 @@
 // its own point of the lens; the scenes of the passes are made once per thread and reused by every
 // tile, and the passes' times and lens points are the same for every tile.
 //
+// With the motion pass, a plain render's thread also makes the moment one frame later
+// (frameSeconds + 1 / the accumulation's framesPerSecond) and gives its scene and camera to each
+// tile's outputs as their motion target.
+//
 // A failure on any thread (ExRenderCancelled from the interrupt handler among them) stops the
 // others after their current tile and is thrown again by render once all have ended.
 #include <functional>

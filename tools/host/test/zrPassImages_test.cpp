@@ -1,7 +1,8 @@
 // The compositing passes of the sample scene (all in the normal mode) rendered as tiles on several threads and read back
 // from their OpenEXR files: the layers carry the conventional channel names and the picture
 // unchanged, both files are the same on any number of threads, every deep pixel laid front to
-// back gives the picture's pixel, and Z is the depth of its opaque sample.
+// back gives the picture's pixel, Z is the depth of its opaque sample, and with the camera rising
+// from one frame to the next the motion pass points down the picture as it is viewed.
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -24,7 +25,7 @@ struct Rendered {
 Rendered renderWithPasses(int threads, int width, int height) {
     // A deep sample is a layer laid "over" what lies behind; the sample scene's one material of
     // the screen mode, which is not, is made normal here. Each thread has a description of its own.
-    const auto momentAt = [width, height](double) {
+    const auto momentAt = [width, height](double seconds) {
         const RCShdPtr<SdScene> description = ZrSampleScene::makeDescription();
         for (const RCShdPtr<SdInstance>& instance : description->getGeometry()) {
             std::vector<RCShdPtr<const SdMaterial>> materials;
@@ -35,9 +36,12 @@ Rendered renderWithPasses(int threads, int width, int height) {
             }
             instance->setMaterials(materials);
         }
-        return ZrTileRenderer::momentOf(description, ZrSampleScene::makeCamera(width, height));
+        // The camera rises half a unit a frame (at 24 per second): the scene sinks in the picture.
+        const RCShdPtr<SdInstance> camera = ZrSampleScene::makeCamera(width, height);
+        camera->setMatrix(GeAffineMatrix3<float>::makeTranslation({0.0f, float(12 * seconds), 0.0f}) * camera->getMatrix());
+        return ZrTileRenderer::momentOf(description, camera);
     };
-    ZrPassImages passes(ZrPassImages::parse("z,n,p,uv,id"), true, width, height);
+    ZrPassImages passes(ZrPassImages::parse("z,n,p,uv,id,motion"), true, width, height);
     ZrRenderSettings settings;
     settings.floatPixels = true;
     settings.tileSize = 32;
@@ -73,7 +77,7 @@ TEST(ZrPassImages, FilesHoldThePassesAndTheDeepPixelsFlattenToThePicture) {
     std::vector<std::string> names;
     for (int c = 0; c < one.layers.nchannels(); ++c) names.push_back(one.layers.spec().channel_name(c));
     for (const char* name : {"R", "G", "B", "A", "Z", "N.X", "N.Y", "N.Z", "P.X", "P.Y", "P.Z", "UV.U", "UV.V",
-                             "ObjectID", "MaterialID"})
+                             "ObjectID", "MaterialID", "motion.u", "motion.v"})
         EXPECT_NE(std::find(names.begin(), names.end(), name), names.end()) << name;
     EXPECT_EQ(valuesOf(one.layers), valuesOf(three.layers));
     const OIIO::DeepData& deepOne = *one.deep.deepdata();
@@ -113,6 +117,13 @@ TEST(ZrPassImages, FilesHoldThePassesAndTheDeepPixelsFlattenToThePicture) {
             EXPECT_NEAR(flat[c], layered[std::size_t(p) * channels + rgba[c]], 2e-6) << "pixel " << p << " channel " << c;
     }
     EXPECT_GT(layeredPixels, 100) << "the sample scene's transparent objects";
+
+    // Motion: down the picture as viewed, wherever something opaque was drawn.
+    const int id = one.layers.spec().channelindex("ObjectID"), v = one.layers.spec().channelindex("motion.v");
+    for (std::size_t p = 0; p < layered.size() / channels; ++p)
+        if (layered[p * channels + id] > 0) {
+            EXPECT_LT(layered[p * channels + v], 0.0f) << "pixel " << p;
+        }
 }
 
 }  // namespace
