@@ -78,7 +78,6 @@ public:
     void setMotionTarget(const RsScene& later, const GeAffineMatrix3<float>& laterWorldToCamera,
                          const GeProjectiveMatrix3<double>& laterProjection);
     void clearMotionTarget() { _hasTarget = false; }
-    bool hasMotion() const { return _hasTarget; }
 
     // Row-major over the region; one, three, three, two, one and one floats per pixel.
     const std::vector<float>& getZ() const { return _z; }
