@@ -201,16 +201,19 @@ struct MovingSpheres {
     const GeVector3<double> slide{0.3, -0.25, 0.4};
     const GeAffineMatrix3<double> turn = GeAffineMatrix3<double>::makeRotation({0.2, 1.0, 0.3}, 0.25);
     // Where a point of sphere k now is later.
-    GePoint3<double> later(int k, const GePoint3<double>& p) const { return k == 0 ? p + slide : turn.transformPoint(p); }
+    GePoint3<double> later(int k, const GePoint3<double>& p) const {
+        return k == 0 ? p + slide : turn.transformPoint(p);
+    }
     RsAuxOutputs render() const {
         const RCShdPtr<const SdMesh> mesh = makeSphereMesh(1.0f, 64, 32);
         const GeAffineMatrix3<float> spin = GeAffineMatrix3<float>::makeRotation({1.0f, 0.2f, 0.4f}, 0.7f);
         const auto place = [&](const GePoint3<double>& c) {
             return GeAffineMatrix3<float>::makeTranslation({float(c.x), float(c.y), float(c.z)}) * spin;
         };
-        const RCShdPtr<RsScene> now = makeScene({drawn(mesh, {}, place(centres[0])), drawn(mesh, {}, place(centres[1]))});
-        const RCShdPtr<RsScene> then = makeScene(
-            {drawn(mesh, {}, place(centres[0] + slide)), drawn(mesh, {}, GeAffineMatrix3<float>(turn) * place(centres[1]))});
+        const RCShdPtr<RsScene> now =
+            makeScene({drawn(mesh, {}, place(centres[0])), drawn(mesh, {}, place(centres[1]))});
+        const RCShdPtr<RsScene> then = makeScene({drawn(mesh, {}, place(centres[0] + slide)),
+                                                  drawn(mesh, {}, GeAffineMatrix3<float>(turn) * place(centres[1]))});
         RsAuxOutputs aux(rect, false, false);
         aux.setMotionTarget(*then, cameraLater.computeInverse(), projection);
         RsRenderer renderer;

@@ -753,7 +753,8 @@ inline double raySphere(const GePoint3<double>& eye, const GeVector3<double>& d,
 inline GePoint2<double> pixelOfPoint(const GeProjectiveMatrix3<double>& projection, const GeRectangle<int>& rectangle,
                                      const GePoint3<double>& p) {
     const double sx = (rectangle.x1 - rectangle.x0) * 0.5, sy = (rectangle.y1 - rectangle.y0) * 0.5;
-    return {rectangle.x0 + sx * (1 + projection(0, 0) * p.x / -p.z), rectangle.y0 + sy * (1 + projection(1, 1) * p.y / -p.z)};
+    return {rectangle.x0 + sx * (1 + projection(0, 0) * p.x / -p.z),
+            rectangle.y0 + sy * (1 + projection(1, 1) * p.y / -p.z)};
 }
 
 // Deep samples (nearest first, premultiplied) laid front to back with "over".

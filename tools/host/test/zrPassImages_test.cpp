@@ -38,7 +38,8 @@ Rendered renderWithPasses(int threads, int width, int height) {
         }
         // The camera rises half a unit a frame (at 24 per second): the scene sinks in the picture.
         const RCShdPtr<SdInstance> camera = ZrSampleScene::makeCamera(width, height);
-        camera->setMatrix(GeAffineMatrix3<float>::makeTranslation({0.0f, float(12 * seconds), 0.0f}) * camera->getMatrix());
+        camera->setMatrix(GeAffineMatrix3<float>::makeTranslation({0.0f, float(12 * seconds), 0.0f}) *
+                          camera->getMatrix());
         return ZrTileRenderer::momentOf(description, camera);
     };
     ZrPassImages passes(ZrPassImages::parse("z,n,p,uv,id,motion"), true, width, height);
