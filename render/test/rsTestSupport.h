@@ -140,26 +140,24 @@ inline GeProjectiveMatrix3<double> perspective(double fov, double n, double f) {
 // middle to its corners; the widest cells (at the equator) have cos h = cos(pi / stacks / 2) *
 // cos(pi / slices).
 inline RCShdPtr<const SdMesh> makeSphereMesh(float r, int slices, int stacks) {
-    std::vector<GePoint3<float>> points{{0, 0, r}};
     std::vector<GeVector3<float>> normals{{0, 0, 1}};
     for (int i = 1; i < stacks; ++i)
         for (int j = 0; j < slices; ++j) {
             const double theta = M_PI * i / stacks, phi = 2 * M_PI * j / slices;
-            const GeVector3<float> n(float(std::sin(theta) * std::cos(phi)), float(std::sin(theta) * std::sin(phi)),
-                                     float(std::cos(theta)));
-            normals.push_back(n);
-            points.emplace_back(r * n.x, r * n.y, r * n.z);
+            normals.emplace_back(float(std::sin(theta) * std::cos(phi)), float(std::sin(theta) * std::sin(phi)),
+                                 float(std::cos(theta)));
         }
-    points.emplace_back(0.0f, 0.0f, -r);
     normals.emplace_back(0.0f, 0.0f, -1.0f);
+    std::vector<GePoint3<float>> points;
+    for (const GeVector3<float>& n : normals) points.emplace_back(r * n.x, r * n.y, r * n.z);
     const auto at = [slices](int i, int j) { return std::uint32_t(1 + (i - 1) * slices + j % slices); };
     const std::uint32_t south = std::uint32_t(points.size() - 1);
     std::vector<std::uint32_t> triangles;
     for (int j = 0; j < slices; ++j) {
         triangles.insert(triangles.end(), {0, at(1, j), at(1, j + 1), south, at(stacks - 1, j + 1), at(stacks - 1, j)});
         for (int i = 1; i + 1 < stacks; ++i)
-            triangles.insert(triangles.end(), {at(i, j), at(i + 1, j), at(i + 1, j + 1), at(i, j), at(i + 1, j + 1),
-                                               at(i, j + 1)});
+            triangles.insert(triangles.end(),
+                             {at(i, j), at(i + 1, j), at(i + 1, j + 1), at(i, j), at(i + 1, j + 1), at(i, j + 1)});
     }
     return SdMeshBuilder().setVertices(points).setTriangles(triangles).setNormals(normals).build();
 }
