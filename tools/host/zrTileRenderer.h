@@ -81,7 +81,8 @@ public:
 
     // The picture of width x height pixels at frameSeconds, rows from the top down (see
     // ZrImageFile), with the accumulation's effects. momentAt gives the scene and the camera at a
-    // time; it is called once per thread (and per pass of the effects), one call at a time.
+    // time; it is called once per thread (and per pass of the effects, and for the moment a frame
+    // later of the motion pass), one call at a time.
     // progress, when given, hears of each tile done.
     static OIIO::ImageBuf render(const MomentMaker& momentAt, double frameSeconds, int width, int height,
                                  const ZrRenderSettings& settings, const ZrAccumulationSettings& accumulation = {},
