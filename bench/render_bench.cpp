@@ -19,6 +19,7 @@
 #include "ixWriteGuard.h"
 #include "rsAuxOutputs.h"
 #include "rsRenderer.h"
+#include "sdCamera.h"
 #include "zrBenchScenes.h"
 #include "zrDiffuseShader.h"
 #include "zrSampleScene.h"
@@ -92,12 +93,21 @@ void BM_SampleScene(benchmark::State& state) { sampleScene(state, -1); }
 BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 2160})->Unit(benchmark::kMillisecond);
 
 // The sample scene with compositing passes: third argument 0 for none, 1 for the surface channels
-// (Z, N, P, UV, IDs), 2 for deep samples, 3 for both.
+// (Z, N, P, UV, IDs), 2 for deep samples, 3 for both, 5 for the surface channels with motion
+// vectors (towards the camera a step to the right).
 void BM_SampleScenePasses(benchmark::State& state) {
     std::uint64_t fragments = 0;
     const RCShdPtr<RsScene> scene = ZrSampleScene::makeUnlitScene(countingShaders(fragments));
     const GeRectangle<int> rectangle{0, static_cast<int>(state.range(0)), 0, static_cast<int>(state.range(1))};
     RsAuxOutputs aux(rectangle, (state.range(2) & 1) != 0, (state.range(2) & 2) != 0);
+    if ((state.range(2) & 4) != 0) {
+        const RCShdPtr<SdInstance> camera = sampleCamera(state);
+        GeProjectiveMatrix3<double> projection;
+        dynamic_cast<const SdCamera&>(*camera->getObject()).computeProjection(projection);
+        aux.setMotionTarget(
+            *scene, (GeAffineMatrix3<float>::makeTranslation({0.1f, 0.0f, 0.0f}) * camera->getMatrix()).computeInverse(),
+            projection);
+    }
     renderLoop(state, scene, sampleCamera(state), fragments, -1, state.range(2) != 0 ? &aux : nullptr);
 }
 BENCHMARK(BM_SampleScenePasses)
@@ -105,6 +115,7 @@ BENCHMARK(BM_SampleScenePasses)
     ->Args({1920, 1080, 1})
     ->Args({1920, 1080, 2})
     ->Args({1920, 1080, 3})
+    ->Args({1920, 1080, 5})
     ->Unit(benchmark::kMillisecond);
 
 // The sample scene as zrender draws it: three lights and the standard material. Its fragments

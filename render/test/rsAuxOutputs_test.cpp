@@ -1,7 +1,9 @@
 // The surface channels and deep samples that a render gathers beside its picture: a tilted,
 // textured quad seen in perspective from a moved camera against the closed form of the ray through
 // each pixel centre, and random layered scenes whose front-most opaque-enough layer and deep lists
-// are known, with the flattened deep pixel equal to the picture.
+// are known, with the flattened deep pixel equal to the picture; spheres against the ray-sphere
+// intersection, and their motion vectors, as they and the camera move, against the screen
+// displacement of the moved point.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -198,6 +200,106 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
                 expectNearRgba(flat, premultiplied(picture.at(x, y)), 1e-5, where);
             }
     }
+}
+
+// Two spheres (radius 1, 64 meridians, 32 parallels, turned in place) in perspective, seen by a
+// camera that moves from now to later while the first slides and the second turns about an axis
+// through the world origin. Each pixel whose ray meets a sphere well inside its outline (within
+// 0.8 of the centre) keeps the sphere and the hit; one that clearly misses both keeps -1.
+class RsAuxOutputsSpheres : public ::testing::Test {
+protected:
+    const GeRectangle<int> rect{0, 64, 0, 48};
+    const GeProjectiveMatrix3<double> projection = perspective(0.8, 0.5, 50.0);
+    const GeAffineMatrix3<float> cameraNow = GeAffineMatrix3<float>::makeTranslation({0.5f, -1.0f, 7.0f}) *
+                                             GeAffineMatrix3<float>::makeRotation({0.3f, 1.0f, 0.2f}, 0.3f);
+    const GeAffineMatrix3<float> cameraLater = GeAffineMatrix3<float>::makeTranslation({0.8f, -0.6f, 7.4f}) *
+                                               GeAffineMatrix3<float>::makeRotation({0.2f, 1.0f, 0.5f}, 0.36f);
+    const GePoint3<double> centres[2] = {{-1.4, 0.3, 0.0}, {1.2, -0.4, -0.5}};
+    const GeAffineMatrix3<double> moves[2] = {GeAffineMatrix3<double>::makeTranslation({0.3, -0.25, 0.4}),
+                                              GeAffineMatrix3<double>::makeRotation({0.2, 1.0, 0.3}, 0.25)};
+    // The faces lie within g = r (1 - cos h) of the sphere, cos h = cos(pi / 64)^2.
+    const double g = 1 - std::cos(M_PI / 64) * std::cos(M_PI / 64);
+    RsAuxOutputs aux{rect, false, false};
+    struct Hit {
+        int x, y, k;
+        GePoint3<double> p;
+    };
+    std::vector<Hit> hits;
+
+    void SetUp() override {
+        const RCShdPtr<const SdMesh> mesh = makeSphereMesh(1.0f, 64, 32);
+        std::vector<RCShdPtr<RsGeomInstance>> now, later;
+        for (const int k : {0, 1}) {
+            const GeAffineMatrix3<float> place =
+                GeAffineMatrix3<float>::makeTranslation({float(centres[k].x), float(centres[k].y), float(centres[k].z)}) *
+                GeAffineMatrix3<float>::makeRotation({1.0f, 0.2f, 0.4f}, 0.7f);
+            now.push_back(drawn(mesh, {}, place));
+            later.push_back(drawn(mesh, {}, GeAffineMatrix3<float>(moves[k]) * place));
+        }
+        aux.setMotionTarget(*makeScene(later), cameraLater.computeInverse(), projection);
+        RsRenderer renderer;
+        renderer.setAuxOutputs(&aux);
+        Picture picture(rect);
+        renderer.render(cameraNow.computeInverse(), projection, makeScene(now), rect, picture.guard);
+
+        const GeAffineMatrix3<double> toWorld(cameraNow);
+        const GePoint3<double> eye = toWorld.transformPoint({0, 0, 0});
+        for (int y = rect.y0; y < rect.y1; ++y)
+            for (int x = rect.x0; x < rect.x1; ++x) {
+                const GeVector3<double> d = toWorld.transformVector(rayThroughPixel(projection, rect, x, y));
+                double t[2], near[2], far[2];
+                for (const int k : {0, 1}) {
+                    t[k] = raySphere(eye, d, centres[k], 1.0);
+                    near[k] = raySphere(eye, d, centres[k], 0.8), far[k] = raySphere(eye, d, centres[k], 1.1);
+                }
+                const int k = t[1] > 0 && (t[0] < 0 || t[1] < t[0]) ? 1 : 0;
+                if (near[k] > 0) hits.push_back({x, y, k, eye + d * t[k]});
+                if (far[0] < 0 && far[1] < 0) hits.push_back({x, y, -1, eye});
+            }
+    }
+};
+
+// Z, N and P are the ray-sphere intersection's: with the ray at most 53 degrees off the normal,
+// the face's hit lies within 2g of the sphere's, and the normal, interpolated from the vertices'
+// unit positions, points from the centre to the face's hit.
+TEST_F(RsAuxOutputsSpheres, ChannelsEqualTheRaySphereIntersection) {
+    const GeAffineMatrix3<double> worldToCamera(cameraNow.computeInverse());
+    int met = 0;
+    for (const Hit& h : hits) {
+        if (h.k < 0) continue;
+        ++met;
+        const std::size_t i = aux.indexOf(h.x, h.y);
+        const std::string where = "at " + std::to_string(h.x) + "," + std::to_string(h.y);
+        EXPECT_NEAR(aux.getZ()[i], -worldToCamera.transformPoint(h.p).z, 2 * g) << where;
+        const GeVector3<double> n = h.p - centres[h.k];
+        for (int c = 0; c < 3; ++c) {
+            EXPECT_NEAR(aux.getPosition()[3 * i + c], (&h.p.x)[c], 2 * g) << where;
+            EXPECT_NEAR(aux.getNormal()[3 * i + c], (&n.x)[c], 2 * g) << where;
+        }
+    }
+    EXPECT_GT(met, 250);
+}
+
+// The motion is the later point's position in the picture through the later camera less the
+// pixel centre, 0 where nothing was drawn. The hit (within 2g of the face's) seen from 5 or more
+// away moves by at most 2g * 80 / 5 pixels.
+TEST_F(RsAuxOutputsSpheres, MotionIsTheScreenDisplacementOfTheMovedPoint) {
+    const GeAffineMatrix3<double> laterWorldToCamera(cameraLater.computeInverse());
+    double largest = 0;
+    for (const Hit& h : hits) {
+        const std::size_t i = aux.indexOf(h.x, h.y);
+        GePoint2<double> want(0, 0);
+        if (h.k >= 0) {
+            const GePoint3<double> later = laterWorldToCamera.transformPoint(moves[h.k].transformPoint(h.p));
+            want = pixelOfPoint(projection, rect, later);
+            want = {want.x - h.x - 0.5, want.y - h.y - 0.5};
+            largest = std::max(largest, std::hypot(want.x, want.y));
+        }
+        const std::string where = "at " + std::to_string(h.x) + "," + std::to_string(h.y);
+        EXPECT_NEAR(aux.getMotion()[2 * i], want.x, 2 * g * 80 / 5) << where;
+        EXPECT_NEAR(aux.getMotion()[2 * i + 1], want.y, 2 * g * 80 / 5) << where;
+    }
+    EXPECT_GT(largest, 3.0);
 }
 
 }  // namespace

@@ -134,6 +134,34 @@ inline GeProjectiveMatrix3<double> perspective(double fov, double n, double f) {
     return {c, 0, 0, 0, 0, c, 0, 0, 0, 0, (f + n) / (n - f), 2 * f * n / (n - f), 0, 0, -1, 0};
 }
 
+// A sphere of radius r about the origin, of slices meridians and stacks parallels, its vertex
+// normals exact (the unit positions). The two triangles of a cell share the plane of its four
+// corners, so a face lies within r (1 - cos h) inside the sphere, h the angle from the cell's
+// middle to its corners; the widest cells (at the equator) have cos h = cos(pi / stacks / 2) *
+// cos(pi / slices).
+inline RCShdPtr<const SdMesh> makeSphereMesh(float r, int slices, int stacks) {
+    std::vector<GeVector3<float>> normals{{0, 0, 1}};
+    for (int i = 1; i < stacks; ++i)
+        for (int j = 0; j < slices; ++j) {
+            const double theta = M_PI * i / stacks, phi = 2 * M_PI * j / slices;
+            normals.emplace_back(float(std::sin(theta) * std::cos(phi)), float(std::sin(theta) * std::sin(phi)),
+                                 float(std::cos(theta)));
+        }
+    normals.emplace_back(0.0f, 0.0f, -1.0f);
+    std::vector<GePoint3<float>> points;
+    for (const GeVector3<float>& n : normals) points.emplace_back(r * n.x, r * n.y, r * n.z);
+    const auto at = [slices](int i, int j) { return std::uint32_t(1 + (i - 1) * slices + j % slices); };
+    const std::uint32_t south = std::uint32_t(points.size() - 1);
+    std::vector<std::uint32_t> triangles;
+    for (int j = 0; j < slices; ++j) {
+        triangles.insert(triangles.end(), {0, at(1, j), at(1, j + 1), south, at(stacks - 1, j + 1), at(stacks - 1, j)});
+        for (int i = 1; i + 1 < stacks; ++i)
+            triangles.insert(triangles.end(),
+                             {at(i, j), at(i + 1, j), at(i + 1, j + 1), at(i, j), at(i + 1, j + 1), at(i, j + 1)});
+    }
+    return SdMeshBuilder().setVertices(points).setTriangles(triangles).setNormals(normals).build();
+}
+
 // Corner c of box (bit 0 picks the x end, bit 1 y, bit 2 z), in double.
 inline GePoint3<double> cornerOf(const GeAlignedBox3<float>& box, int c) {
     return {c & 1 ? box.xMax : box.xMin, c & 2 ? box.yMax : box.yMin, c & 4 ? box.zMax : box.zMin};
@@ -705,6 +733,26 @@ inline GeVector3<double> rayThroughPixel(const GeProjectiveMatrix3<double>& proj
     const double sx = (rectangle.x1 - rectangle.x0) * 0.5, sy = (rectangle.y1 - rectangle.y0) * 0.5;
     const double nx = (x + 0.5 - rectangle.x0 - sx) / sx, ny = (y + 0.5 - rectangle.y0 - sy) / sy;
     return {nx / projection(0, 0), ny / projection(1, 1), -1.0};
+}
+
+// Where the ray from eye along d first meets the sphere of centre c and radius r, in units of d
+// ahead; -1 for a miss.
+inline double raySphere(const GePoint3<double>& eye, const GeVector3<double>& d, const GePoint3<double>& c, double r) {
+    const GeVector3<double> o = eye - c;
+    const double a = d.dot(d), b = o.dot(d), disc = b * b - a * (o.dot(o) - r * r);
+    if (disc < 0) return -1;
+    const double t = (-b - std::sqrt(disc)) / a;
+    return t > 0 ? t : -1;
+}
+
+// The picture position (x, y in pixels, centre of pixel (i, j) at i + 0.5, j + 0.5) of a
+// camera-space point, for a projection of diagonal x and y rows and w = -z (such as perspective):
+// the inverse of rayThroughPixel.
+inline GePoint2<double> pixelOfPoint(const GeProjectiveMatrix3<double>& projection, const GeRectangle<int>& rectangle,
+                                     const GePoint3<double>& p) {
+    const double sx = (rectangle.x1 - rectangle.x0) * 0.5, sy = (rectangle.y1 - rectangle.y0) * 0.5;
+    return {rectangle.x0 + sx * (1 + projection(0, 0) * p.x / -p.z),
+            rectangle.y0 + sy * (1 + projection(1, 1) * p.y / -p.z)};
 }
 
 // Deep samples (nearest first, premultiplied) laid front to back with "over".

@@ -27,6 +27,8 @@ const std::vector<PassChannels>& passChannels() {
         {ZrPassImages::texCoord, {"UV.U", "UV.V"}, &RsAuxOutputs::getTexCoord},
         {ZrPassImages::ids, {"ObjectID"}, &RsAuxOutputs::getObjectId},
         {ZrPassImages::ids, {"MaterialID"}, &RsAuxOutputs::getMaterialId},
+        // The library's rows, like v, count upwards: the rows alone are turned over.
+        {ZrPassImages::motion, {"motion.u", "motion.v"}, &RsAuxOutputs::getMotion},
     };
     return channels;
 }
@@ -42,8 +44,9 @@ unsigned ZrPassImages::parse(const std::string& list) {
         else if (name == "p") passes |= position;
         else if (name == "uv") passes |= texCoord;
         else if (name == "id") passes |= ids;
+        else if (name == "motion") passes |= motion;
         else if (name == "crypto") passes |= crypto;
-        else throw ZrHostError("--passes: no pass named '" + name + "' (z, n, p, uv, id, crypto)");
+        else throw ZrHostError("--passes: no pass named '" + name + "' (z, n, p, uv, id, motion, crypto)");
     }
     return passes;
 }
@@ -98,7 +101,8 @@ OIIO::ImageBuf ZrPassImages::layers(const OIIO::ImageBuf& picture) const {
         for (const PassChannels* p : wanted) {
             const int count = static_cast<int>(p->names.size());
             const std::vector<float>& values = ((*tile).*(p->values))();
-            for (int y = r.y0; y < r.y1; ++y) {
+            // A tile whose outputs had no motion target keeps motion 0.
+            for (int y = r.y0; y < r.y1 && !values.empty(); ++y) {
                 // The renderer's rows count upwards, the image's down.
                 const OIIO::ROI roi(r.x0, r.x1, _height - 1 - y, _height - y, 0, 1, first, first + count);
                 image.set_pixels(roi, OIIO::TypeDesc::FLOAT, &values[tile->indexOf(r.x0, y) * count]);

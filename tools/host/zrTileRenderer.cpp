@@ -15,6 +15,7 @@
 #include "rsAccumulationRenderer.h"
 #include "rsRenderer.h"
 #include "rsSceneBuilder.h"
+#include "sdCamera.h"
 #include "sdStdLight.h"
 #include "zrPassImages.h"
 #include "zrRenderProgress.h"
@@ -116,6 +117,15 @@ void holdShadowMaps(const ZrMoment& moment) {
         if (auto* light = dynamic_cast<SdStdLight*>(instance->getObject().get())) light->_shadowsActive = 0;
 }
 
+// Points the motion vectors of a tile's outputs at the moment later.
+void aimMotion(RsAuxOutputs& outputs, const ZrMoment& later) {
+    const auto* camera = dynamic_cast<const SdCamera*>(later.camera->getObject().get());
+    if (camera == nullptr) return;
+    GeProjectiveMatrix3<double> projection;
+    camera->computeProjection(projection);
+    outputs.setMotionTarget(*later.scene, later.camera->getMatrix().computeInverse(), projection);
+}
+
 template <class Renderer>
 void configure(Renderer& renderer, const ZrRenderSettings& settings) {
     renderer.setAntialiasing(settings.antialiasing);
@@ -140,11 +150,16 @@ OIIO::ImageBuf ZrTileRenderer::render(const MomentMaker& momentAt, double frameS
         // One ordinary render; each thread has a scene of its own.
         return renderTiles(width, height, settings, progress, [&]() -> TileWorker {
             const ZrMoment moment = momentAt(frameSeconds);
+            // The motion pass looks one frame ahead.
+            ZrMoment later;
+            if (settings.passes && settings.passes->wantsMotion())
+                later = momentAt(frameSeconds + 1.0 / accumulation.framesPerSecond.getDouble());
             RCShdPtr<RsRenderer> renderer = makeShared<RsRenderer>();
             configure(*renderer, settings);
             return [=](IxTile& tile) {
                 std::unique_ptr<RsAuxOutputs> passes;
                 if (settings.passes) passes = settings.passes->makeTileOutputs(tile.getRectangle());
+                if (passes && later.scene) aimMotion(*passes, later);
                 renderer->setAuxOutputs(passes.get());
                 renderer->render(moment.camera, moment.scene, picture, IxWriteGuard(tile));
                 renderer->setAuxOutputs(nullptr);

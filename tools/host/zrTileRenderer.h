@@ -16,6 +16,10 @@
 // its own point of the lens; the scenes of the passes are made once per thread and reused by every
 // tile, and the passes' times and lens points are the same for every tile.
 //
+// With the motion pass, a plain render's thread also makes the moment one frame later
+// (frameSeconds + 1 / the accumulation's framesPerSecond) and gives its scene and camera to each
+// tile's outputs as their motion target.
+//
 // A failure on any thread (ExRenderCancelled from the interrupt handler among them) stops the
 // others after their current tile and is thrown again by render once all have ended.
 #include <functional>
@@ -77,7 +81,8 @@ public:
 
     // The picture of width x height pixels at frameSeconds, rows from the top down (see
     // ZrImageFile), with the accumulation's effects. momentAt gives the scene and the camera at a
-    // time; it is called once per thread (and per pass of the effects), one call at a time.
+    // time; it is called once per thread (and per pass of the effects, and for the moment a frame
+    // later of the motion pass), one call at a time.
     // progress, when given, hears of each tile done.
     static OIIO::ImageBuf render(const MomentMaker& momentAt, double frameSeconds, int width, int height,
                                  const ZrRenderSettings& settings, const ZrAccumulationSettings& accumulation = {},

@@ -155,7 +155,7 @@ int ZrOptions::parse(int argc, const char* const* argv, ZrOptions& o) {
         ->type_name("N")
         ->check(CLI::Range(16, 16384));
     // Compositing passes.
-    app.add_option("--passes", o.passes, "also write the passes LIST (of z, n, p, uv, id, crypto) as layers of the "
+    app.add_option("--passes", o.passes, "also write the passes LIST (of z, n, p, uv, id, motion, crypto) as layers of the "
                                          "picture, which must be an OpenEXR file")
         ->type_name("LIST");
     app.add_option("--deep", o.deep, "also write every fragment of every pixel to the deep OpenEXR FILE")

@@ -8,6 +8,7 @@
 #include "rsFZBufferFactory.h"
 #include "rsGeomInstance.h"
 #include "rsMaterialShader.h"
+#include "rsPixelMatrix.h"
 
 namespace Zr {
 
@@ -66,6 +67,32 @@ void RsAuxOutputs::begin(const RsScene& scene, const GeAffineMatrix3<float>& wor
     }
 }
 
+void RsAuxOutputs::setMotionTarget(const RsScene& later, const GeAffineMatrix3<float>& laterWorldToCamera,
+                                   const GeProjectiveMatrix3<double>& laterProjection) {
+    _surface = true;
+    _hasTarget = true;
+    _laterMatrices.clear();
+    for (const RCShdPtr<RsGeomInstance>& instance : later._geomInstances) _laterMatrices.push_back(instance->_matrix);
+    _laterWorldToCamera = laterWorldToCamera;
+    _laterProjection = laterProjection;
+}
+
+void RsAuxOutputs::beginMotion(const RsScene& scene, const GeRectangle<int>& rectangle) {
+    _toLaterPixels.clear();
+    _motion.assign(_hasTarget ? 2 * _objectId.size() : 0, 0.0f);
+    if (!_hasTarget) return;
+    const GeProjectiveMatrix3<double> view = rsPixelMatrix<double>(_laterProjection, rectangle) *
+                                             GeProjectiveMatrix3<double>(GeAffineMatrix3<double>(_laterWorldToCamera));
+    for (std::size_t i = 0; i < scene._geomInstances.size(); ++i) {
+        // A point of the instance now, carried to the same point of the instance later.
+        const GeAffineMatrix3<double> now(scene._geomInstances[i]->_matrix);
+        const GeAffineMatrix3<double> move = i < _laterMatrices.size()
+                                                 ? GeAffineMatrix3<double>(_laterMatrices[i]) * now.computeInverse()
+                                                 : GeAffineMatrix3<double>();
+        _toLaterPixels.push_back(view * move);
+    }
+}
+
 float RsAuxOutputs::eyeDepthOf(double pixelDepth) const {
     // Undo the viewport (0..1 from -1..1) and the projection's z and w rows.
     const double d = 2.0 * pixelDepth - 1.0;
@@ -94,6 +121,24 @@ void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
                 n[0] = m.x * scale;
                 n[1] = m.y * scale;
                 n[2] = m.z * scale;
+            }
+        }
+    }
+    if (_hasTarget) {
+        // From the world positions made above and the object IDs.
+        for (int row = 0; row < height; ++row) {
+            const std::size_t first = indexOf(buffer.getX(), buffer.getY() + row);
+            for (int x = 0; x < width; ++x) {
+                const std::size_t i = first + std::size_t(x);
+                if (_nearest[i] == kNone) continue;
+                const std::size_t object = std::size_t(_objectId[i]) - 1;
+                if (object >= _toLaterPixels.size()) continue;
+                const float* p = &_position[3 * i];
+                const GeHomogeneousCoord3<double> later =
+                    _toLaterPixels[object].transform(GePoint3<double>(p[0], p[1], p[2]));
+                if (!(later.w > 0.0)) continue;
+                _motion[2 * i] = static_cast<float>(later.x / later.w - (buffer.getX() + x + 0.5));
+                _motion[2 * i + 1] = static_cast<float>(later.y / later.w - (buffer.getY() + row + 0.5));
             }
         }
     }

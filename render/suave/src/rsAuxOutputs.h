@@ -23,6 +23,14 @@
 // transparent black, which for the normal mode is its premultiplied colour, and the object and
 // material IDs of the fragment, numbered as in the surface channels.
 //
+// Motion vectors, when a motion target is given (setMotionTarget): for the fragment that the
+// surface channels describe, where its surface point lands in the picture at the target's time minus
+// where it is now (the pixel centre), in pixels: x to the right, y along the rows as they count
+// here, which is upwards with the camera's y. The point goes from its instance's place now to the
+// same instance's place then, and through the camera of then; so the vectors are exact for rigid
+// motions of objects and camera. 0 where nothing opaque enough was drawn, and where the point
+// lies on or behind the plane of the later camera (a perspective one).
+//
 // Only the path without antialiasing gathers them; a render on the antialiased path leaves them
 // as begin made them. The channels cost nothing to a renderer that has no RsAuxOutputs: its
 // buffers draw with the span methods of a plain render.
@@ -67,6 +75,14 @@ public:
     bool hasSurface() const { return _surface; }
     bool hasDeep() const { return _deep; }
 
+    // Motion vectors towards later, the scene of the render at another time (instances match by
+    // their index in _geomInstances; one beyond later's count stays where it is), seen through
+    // laterWorldToCamera and laterProjection. Turns the surface channels on: the vectors are made
+    // from them. Holds until clearMotionTarget; later is not kept.
+    void setMotionTarget(const RsScene& later, const GeAffineMatrix3<float>& laterWorldToCamera,
+                         const GeProjectiveMatrix3<double>& laterProjection);
+    void clearMotionTarget() { _hasTarget = false; }
+
     // Row-major over the region; one, three, three, two, one and one floats per pixel.
     const std::vector<float>& getZ() const { return _z; }
     const std::vector<float>& getNormal() const { return _normal; }
@@ -74,6 +90,8 @@ public:
     const std::vector<float>& getTexCoord() const { return _texCoord; }
     const std::vector<float>& getObjectId() const { return _objectId; }
     const std::vector<float>& getMaterialId() const { return _materialId; }
+    // Two floats per pixel (x, y) with a motion target, else empty.
+    const std::vector<float>& getMotion() const { return _motion; }
 
     // Per pixel the index of its first sample and their count; the samples of a pixel follow
     // each other, nearest first.
@@ -93,6 +111,9 @@ public:
     // Clears every channel for a render of scene through the view.
     void begin(const RsScene& scene, const GeAffineMatrix3<float>& worldToCamera,
                const GeProjectiveMatrix3<double>& projection);
+    // Readies the motion vectors of a render of scene whose projection spans rectangle (in
+    // pixels); after begin. Without a motion target, clears them to nothing.
+    void beginMotion(const RsScene& scene, const GeRectangle<int>& rectangle);
     // The index of image pixel (x, y), which must lie in the region.
     std::size_t indexOf(int x, int y) const {
         return std::size_t(y - _region.y0) * std::size_t(_region.x1 - _region.x0) + std::size_t(x - _region.x0);
@@ -164,6 +185,14 @@ private:
         float materialId;
     };
     std::vector<FragmentIds> _fragmentIds;
+    // The motion target: the later instances' matrices and the later view.
+    bool _hasTarget = false;
+    std::vector<GeAffineMatrix3<float>> _laterMatrices;
+    GeAffineMatrix3<float> _laterWorldToCamera;
+    GeProjectiveMatrix3<double> _laterProjection;
+    // Per instance of the render, world space now to later pixels; two floats per pixel.
+    std::vector<GeProjectiveMatrix3<double>> _toLaterPixels;
+    std::vector<float> _motion;
 };
 
 }  // namespace Zr

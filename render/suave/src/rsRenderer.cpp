@@ -89,6 +89,7 @@ void RsRenderer::renderCommon(const RCShdPtr<RsScene>& scene, const GeAffineMatr
     factory.setMemory(_bufferMemory.get());
     if (_auxOutputs != nullptr) {
         _auxOutputs->begin(*scene, worldToCamera, projection);
+        _auxOutputs->beginMotion(*scene, rectangle);
         factory.setAuxOutputs(_auxOutputs);
     }
     renderWithFactory(factory, scene, _zBuffer, worldToCamera, projection, rectangle);

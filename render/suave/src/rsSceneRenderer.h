@@ -21,6 +21,7 @@
 #include "rsCullAndSort.h"
 #include "rsGeomInstance.h"
 #include "rsInstanceVertices.h"
+#include "rsPixelMatrix.h"
 #include "rsRegionDrawer.h"
 #include "rsShadingContext.h"
 
@@ -40,15 +41,7 @@ public:
         _worldToCamera = worldToCamera;
         _projection = projection;
         _region = rectangle;
-        const float sx = static_cast<float>(rectangle.x1 - rectangle.x0) * 0.5f;
-        const float sy = static_cast<float>(rectangle.y1 - rectangle.y0) * 0.5f;
-        const float ox = static_cast<float>(rectangle.x0) + sx;
-        const float oy = static_cast<float>(rectangle.y0) + sy;
-        const GeProjectiveMatrix3<float> viewport(sx, 0.0f, 0.0f, ox,  //
-                                                  0.0f, sy, 0.0f, oy,  //
-                                                  0.0f, 0.0f, 0.5f, 0.5f,  //
-                                                  0.0f, 0.0f, 0.0f, 1.0f);
-        _pixelMatrix = viewport * GeProjectiveMatrix3<float>(projection);
+        _pixelMatrix = rsPixelMatrix<float>(projection, rectangle);
         _orthographic = projection(3, 2) == 0.0;
     }
 

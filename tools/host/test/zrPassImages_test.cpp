@@ -1,8 +1,9 @@
 // The compositing passes of the sample scene (all in the normal mode) rendered as tiles on several threads and read back
 // from their OpenEXR files: the layers carry the conventional channel names and the picture
 // unchanged, both files are the same on any number of threads, every deep pixel laid front to
-// back gives the picture's pixel, and Z is the depth of its opaque sample; the ID mattes name
-// the scene's objects and materials and give each its coverage of the deep pixels.
+// back gives the picture's pixel, Z is the depth of its opaque sample, and with the camera rising
+// from one frame to the next the motion pass points down the picture as it is viewed; the ID
+// mattes name the scene's objects and materials and give each its coverage of the deep pixels.
 #include <gtest/gtest.h>
 
 #include <bit>
@@ -32,7 +33,7 @@ Rendered renderWithPasses(int threads, int width, int height, bool deep = true) 
     // A deep sample is a layer laid "over" what lies behind; the sample scene's one material of
     // the screen mode, which is not, is made normal here; the last instance and its material lose
     // their names. Each thread has a description of its own.
-    const auto momentAt = [width, height](double) {
+    const auto momentAt = [width, height](double seconds) {
         const RCShdPtr<SdScene> description = ZrSampleScene::makeDescription();
         for (const RCShdPtr<SdInstance>& instance : description->getGeometry()) {
             std::vector<RCShdPtr<const SdMaterial>> materials;
@@ -45,9 +46,13 @@ Rendered renderWithPasses(int threads, int width, int height, bool deep = true) 
             instance->setMaterials(materials);
         }
         description->getGeometry().back()->setName("");
-        return ZrTileRenderer::momentOf(description, ZrSampleScene::makeCamera(width, height));
+        // The camera rises half a unit a frame (at 24 per second): the scene sinks in the picture.
+        const RCShdPtr<SdInstance> camera = ZrSampleScene::makeCamera(width, height);
+        camera->setMatrix(GeAffineMatrix3<float>::makeTranslation({0.0f, float(12 * seconds), 0.0f}) *
+                          camera->getMatrix());
+        return ZrTileRenderer::momentOf(description, camera);
     };
-    ZrPassImages passes(ZrPassImages::parse("z,n,p,uv,id,crypto"), deep, width, height);
+    ZrPassImages passes(ZrPassImages::parse("z,n,p,uv,id,motion,crypto"), deep, width, height);
     ZrRenderSettings settings;
     settings.floatPixels = true;
     settings.tileSize = 32;
@@ -83,7 +88,7 @@ TEST(ZrPassImages, FilesHoldThePassesAndTheDeepPixelsFlattenToThePicture) {
     std::vector<std::string> names;
     for (int c = 0; c < one.layers.nchannels(); ++c) names.push_back(one.layers.spec().channel_name(c));
     for (const char* name : {"R", "G", "B", "A", "Z", "N.X", "N.Y", "N.Z", "P.X", "P.Y", "P.Z", "UV.U", "UV.V",
-                             "ObjectID", "MaterialID"})
+                             "ObjectID", "MaterialID", "motion.u", "motion.v"})
         EXPECT_NE(std::find(names.begin(), names.end(), name), names.end()) << name;
     EXPECT_EQ(valuesOf(one.layers), valuesOf(three.layers));
     const OIIO::DeepData& deepOne = *one.deep.deepdata();
@@ -124,6 +129,13 @@ TEST(ZrPassImages, FilesHoldThePassesAndTheDeepPixelsFlattenToThePicture) {
             EXPECT_NEAR(flat[c], layered[std::size_t(p) * channels + rgba[c]], 2e-6) << "pixel " << p << " channel " << c;
     }
     EXPECT_GT(layeredPixels, 100) << "the sample scene's transparent objects";
+
+    // Motion: down the picture as viewed, wherever something opaque was drawn.
+    const int id = one.layers.spec().channelindex("ObjectID"), v = one.layers.spec().channelindex("motion.v");
+    for (std::size_t p = 0; p < layered.size() / channels; ++p)
+        if (layered[p * channels + id] > 0) {
+            EXPECT_LT(layered[p * channels + v], 0.0f) << "pixel " << p;
+        }
 }
 
 // The matte of each name, summed over the ranks whose ID the manifest gives the name, against
