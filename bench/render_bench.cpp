@@ -94,7 +94,7 @@ BENCHMARK(BM_SampleScene)->Args({512, 512})->Args({1920, 1080})->Args({3840, 216
 
 // The sample scene with compositing passes: third argument 0 for none, 1 for the surface channels
 // (Z, N, P, UV, IDs), 2 for deep samples, 3 for both, 5 for the surface channels with motion
-// vectors (towards the camera a step to the right).
+// vectors (towards the camera a step to the right), 7 for all of them.
 void BM_SampleScenePasses(benchmark::State& state) {
     std::uint64_t fragments = 0;
     const RCShdPtr<RsScene> scene = ZrSampleScene::makeUnlitScene(countingShaders(fragments));
@@ -116,6 +116,7 @@ BENCHMARK(BM_SampleScenePasses)
     ->Args({1920, 1080, 2})
     ->Args({1920, 1080, 3})
     ->Args({1920, 1080, 5})
+    ->Args({1920, 1080, 7})
     ->Unit(benchmark::kMillisecond);
 
 // The sample scene as zrender draws it: three lights and the standard material. Its fragments
