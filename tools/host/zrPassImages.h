@@ -29,15 +29,10 @@ namespace Zr {
 
 class ZrPassImages {
 public:
-    enum Pass : unsigned {
-        depth = 0x1,
-        normal = 0x2,
-        position = 0x4,
-        texCoord = 0x8,
-        ids = 0x10,
-        crypto = 0x20,
-        motion = 0x40
-    };
+    // clang-format off
+    enum Pass : unsigned { depth = 0x1, normal = 0x2, position = 0x4, texCoord = 0x8, ids = 0x10,
+                           crypto = 0x20, motion = 0x40 };
+    // clang-format on
 
     // The passes of a comma-separated list of z, n, p, uv, id, motion and crypto. Throws
     // ZrHostError for any other name.
