@@ -56,9 +56,8 @@ RsABuffer::RsABuffer(int x, int y, int width, int height, bool zBuffer, bool unp
       _height(height),
       _unpremultiply(unpremultiply),
       _memory(memory),
-      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer), getPixelRegion()),
-      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer), getPixelRegion()),
-      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer), getPixelRegion()) {
+      _rasterizers(*this, spanMethod<RsPlainVertex>(zBuffer), spanMethod<RsNormalVertex>(zBuffer),
+                   spanMethod<RsTangentVertex>(zBuffer), getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
     acquire(getPixelCount(), zBuffer, kEmptyDepth, memory);
 }

@@ -36,6 +36,7 @@
 #include "rsPixelData.h"
 #include "rsPixelSpan.h"
 #include "rsRasterizer.h"
+#include "rsVertexRasterizers.h"
 #include "rsVertices.h"
 
 namespace Zr {
@@ -85,12 +86,7 @@ public:
     // The rasterizer of a vertex kind: RsPlainVertex, RsNormalVertex or RsTangentVertex.
     template <class Vertex>
     const Rasterizer<Vertex>& getRasterizer() const {
-        if constexpr (std::is_same_v<Vertex, RsPlainVertex>) return _rasterizerPlain;
-        else if constexpr (std::is_same_v<Vertex, RsNormalVertex>) return _rasterizerNormal;
-        else {
-            static_assert(std::is_same_v<Vertex, RsTangentVertex>, "no rasterizer for this vertex kind");
-            return _rasterizerTangent;
-        }
+        return _rasterizers.template get<Vertex>();
     }
     // Draws a triangle of vertices after the perspective division, in image pixel coordinates.
     template <class Vertex>
@@ -144,9 +140,7 @@ private:
     Rgba _fillColor{0.0f, 0.0f, 0.0f, 1.0f};
     RsFilterKernel _kernel{RsFilterKernel::KernelBox};
     RsABufferMemory* _memory;
-    Rasterizer<RsTangentVertex> _rasterizerTangent;
-    Rasterizer<RsNormalVertex> _rasterizerNormal;
-    Rasterizer<RsPlainVertex> _rasterizerPlain;
+    RsVertexRasterizers<RsABuffer, Span> _rasterizers;
 };
 
 }  // namespace Zr

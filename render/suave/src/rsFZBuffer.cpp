@@ -32,9 +32,9 @@ RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool u
       _unpremultiply(unpremultiply),
       _aux(aux != nullptr && (aux->hasSurface() || aux->hasDeep()) ? aux : nullptr),
       _memory(memory),
-      _rasterizerTangent(*this, spanMethod<RsTangentVertex>(zBuffer, _aux != nullptr), getPixelRegion()),
-      _rasterizerPlain(*this, spanMethod<RsPlainVertex>(zBuffer, _aux != nullptr), getPixelRegion()),
-      _rasterizerNormal(*this, spanMethod<RsNormalVertex>(zBuffer, _aux != nullptr), getPixelRegion()) {
+      _rasterizers(*this, spanMethod<RsPlainVertex>(zBuffer, _aux != nullptr),
+                   spanMethod<RsNormalVertex>(zBuffer, _aux != nullptr),
+                   spanMethod<RsTangentVertex>(zBuffer, _aux != nullptr), getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
     ZR_ASSERT_AT(_aux == nullptr || width == 0 || height == 0 ||
                      (_aux->getRegion().contains(x, y) && _aux->getRegion().contains(x + width - 1, y + height - 1)),

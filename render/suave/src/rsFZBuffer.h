@@ -34,6 +34,7 @@
 #include "rsPixelData.h"
 #include "rsPixelSpan.h"
 #include "rsRasterizer.h"
+#include "rsVertexRasterizers.h"
 #include "rsVertices.h"
 
 namespace Zr {
@@ -92,18 +93,7 @@ public:
     // The rasterizer of a vertex kind: RsPlainVertex, RsNormalVertex or RsTangentVertex.
     template <class Vertex>
     const Rasterizer<Vertex>& getRasterizer() const {
-        if constexpr (std::is_same_v<Vertex, RsPlainVertex>) return _rasterizerPlain;
-        else if constexpr (std::is_same_v<Vertex, RsNormalVertex>) return _rasterizerNormal;
-        else {
-            static_assert(std::is_same_v<Vertex, RsTangentVertex>, "no rasterizer for this vertex kind");
-            return _rasterizerTangent;
-        }
-    }
-    // Draws a triangle of vertices after the perspective division, in image pixel coordinates,
-    // through the rasterizer of their kind.
-    template <class Vertex>
-    void rasterizeTriangle(const Context& context, const Vertex& v0, const Vertex& v1, const Vertex& v2) const {
-        getRasterizer<Vertex>().rasterizeTriangle(context, v0, v1, v2);
+        return _rasterizers.template get<Vertex>();
     }
 
     // The span methods, for the pixels [span._x1, span._x2) of region-relative row `row`, with the
@@ -144,9 +134,7 @@ private:
     RsDeepShadowMap* _deepShadowMap = nullptr;
     RsAuxOutputs* _aux;
     RsFZBufferMemory* _memory;
-    Rasterizer<RsTangentVertex> _rasterizerTangent;
-    Rasterizer<RsPlainVertex> _rasterizerPlain;
-    Rasterizer<RsNormalVertex> _rasterizerNormal;
+    RsVertexRasterizers<RsFZBuffer, Span> _rasterizers;
 };
 
 }  // namespace Zr
