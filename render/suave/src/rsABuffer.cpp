@@ -59,7 +59,7 @@ RsABuffer::RsABuffer(int x, int y, int width, int height, bool zBuffer, bool unp
       _rasterizers(*this, spanMethod<RsPlainVertex>(zBuffer), spanMethod<RsNormalVertex>(zBuffer),
                    spanMethod<RsTangentVertex>(zBuffer), getPixelRegion()) {
     ZR_ASSERT_AT(width >= 0 && height >= 0, kSourceFile, __LINE__);
-    acquire(getPixelCount(), zBuffer, kEmptyDepth, memory);
+    acquire(getPixelCount(), zBuffer, memory);
 }
 
 RsABuffer::~RsABuffer() {
@@ -254,10 +254,7 @@ void RsABuffer::dump(std::ostream& os) const {
     _fillColor.dump(os);
     os << " _kernel:";
     _kernel.dump(os);
-    os << " _closed: " << static_cast<const void*>(_closed.get())
-       << " _zBuffer: " << static_cast<const void*>(_zBuffer.get())
-       << " _lists: " << static_cast<const void*>(_lists.get()) << " _pool: ";
-    _pool->dump(os);
+    dumpArrays(os);
 }
 
 }  // namespace Zr

@@ -39,7 +39,7 @@ RsFZBuffer::RsFZBuffer(int x, int y, int width, int height, bool zBuffer, bool u
     ZR_ASSERT_AT(_aux == nullptr || width == 0 || height == 0 ||
                      (_aux->getRegion().contains(x, y) && _aux->getRegion().contains(x + width - 1, y + height - 1)),
                  kSourceFile, __LINE__);
-    acquire(getPixelCount(), zBuffer, kEmptyDepth, memory);
+    acquire(getPixelCount(), zBuffer, memory);
 }
 
 RsFZBuffer::~RsFZBuffer() {
@@ -164,10 +164,7 @@ void RsFZBuffer::dump(std::ostream& os) const {
     _output.dump(os);
     os << " _fillColor: ";
     _fillColor.dump(os);
-    os << " _closed: " << static_cast<const void*>(_closed.get())
-       << " _zBuffer: " << static_cast<const void*>(_zBuffer.get())
-       << " _lists: " << static_cast<const void*>(_lists.get()) << " _pool: ";
-    _pool->dump(os);
+    dumpArrays(os);
     os << " _deepShadowMap: " << static_cast<const void*>(_deepShadowMap);
 }
 

@@ -53,8 +53,7 @@ public:
     template <class Vertex>
     using Rasterizer = RsRasterizer<RsFZBuffer, Vertex, Span>;
 
-    // The depth that an empty Z-buffer entry holds: the largest finite double.
-    static constexpr double kEmptyDepth = 1.7976931348623157e308;
+    using RsFragmentArrays<RsFragment, unsigned char>::kEmptyDepth;
 
     // A buffer for the pixels x <= px < x + width, y <= py < y + height, with a Z-buffer when
     // zBuffer is set. unpremultiply is handed to the resolve. The fill colour starts as opaque

@@ -8,6 +8,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <ostream>
 
 #include "rsFragmentPool.h"
 
@@ -15,15 +16,18 @@ namespace Zr {
 
 template <class Fragment, class Closed>
 struct RsFragmentArrays {
+    // The depth that an empty Z-buffer entry holds: the largest finite double.
+    static constexpr double kEmptyDepth = 1.7976931348623157e308;
+
     std::size_t _arrayPixels = 0;  // the length of each per-pixel array
     std::unique_ptr<Closed[]> _closed;
     std::unique_ptr<double[]> _zBuffer;
     std::unique_ptr<Fragment*[]> _lists;
     std::unique_ptr<RsFragmentPool> _pool;
 
-    // Makes the arrays ready for a buffer of pixels pixels: empty lists, and either a Z-buffer
-    // holding emptyDepth or every pixel open. lent, when given, lends what it holds.
-    void acquire(std::size_t pixels, bool zBuffer, double emptyDepth, RsFragmentArrays* lent) {
+    // Makes the arrays ready for a buffer of pixels pixels: empty lists, and either an empty
+    // Z-buffer or every pixel open. lent, when given, lends what it holds.
+    void acquire(std::size_t pixels, bool zBuffer, RsFragmentArrays* lent) {
         if (lent != nullptr && lent->_pool) {
             _pool = std::move(lent->_pool);
             _pool->rewind(static_cast<std::int32_t>(pixels));
@@ -45,7 +49,7 @@ struct RsFragmentArrays {
         std::fill(_lists.get(), _lists.get() + pixels, nullptr);
         if (zBuffer) {
             if (!_zBuffer) _zBuffer = std::make_unique_for_overwrite<double[]>(_arrayPixels);
-            std::fill(_zBuffer.get(), _zBuffer.get() + pixels, emptyDepth);
+            std::fill(_zBuffer.get(), _zBuffer.get() + pixels, kEmptyDepth);
         } else {
             if (!_closed) _closed = std::make_unique_for_overwrite<Closed[]>(_arrayPixels);
             std::fill(_closed.get(), _closed.get() + pixels, Closed(0));  // all open
@@ -67,6 +71,13 @@ struct RsFragmentArrays {
         _closed.reset();
         _lists.reset();
         _pool.reset();
+    }
+
+    void dumpArrays(std::ostream& os) const {
+        os << " _closed: " << static_cast<const void*>(_closed.get())
+           << " _zBuffer: " << static_cast<const void*>(_zBuffer.get())
+           << " _lists: " << static_cast<const void*>(_lists.get()) << " _pool: ";
+        _pool->dump(os);
     }
 
     // The bytes of the arrays and the pool.
