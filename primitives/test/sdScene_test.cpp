@@ -1,5 +1,5 @@
-// Instances and scenes: cyclic materials, sorting instances into the scene's lists, the lifetime of
-// everything a scene holds, and the run-time types of the described classes.
+// Instances and scenes: cyclic materials, sorting instances into the scene's lists, and the
+// lifetime of everything a scene holds.
 #include <gtest/gtest.h>
 
 #include <random>
@@ -84,48 +84,6 @@ TEST(SdScene, AddSortsInstancesByKindAndReleasesEverythingWithTheLastReference) 
     EXPECT_EQ(shared->getReferenceCount() + mesh->getReferenceCount(), 2);
     shared = nullptr;
     EXPECT_EQ(liveObjects, 0);
-}
-
-// A host's own material and light, registered under their own types.
-struct GlassMaterial : SdMaterial {
-    using RttiClassType = RttiGenType1<GlassMaterial, SdMaterial>;
-    const RttiType<SdMaterial>& getType() const override { return RttiClassType::getInstance(); }
-};
-struct AreaLight : SdLight {
-    using RttiClassType = RttiGenType1<AreaLight, SdLight>;
-    const RttiType<SdObject>& getType() const override { return RttiClassType::getInstance(); }
-};
-
-// Each class answers its own type, whose ancestors follow the class hierarchy; materials root a
-// hierarchy of their own, and a type is found in its hierarchy by a checked cast.
-TEST(SdTypes, EachClassAnswersItsTypeWithItsAncestors) {
-    const RttiTypeBase* object = &SdObject::RttiClassType::getInstance();
-    const RttiTypeBase* light = &SdLight::RttiClassType::getInstance();
-    const RttiTypeBase* material = &SdMaterial::RttiClassType::getInstance();
-    const RttiTypeBase* geometry = &SdGeometry::RttiClassType::getInstance();
-    const struct {
-        RCShdPtr<const SdObject> instance;
-        const RttiTypeBase* type;
-        std::vector<const RttiTypeBase*> ancestors;
-    } cases[] = {
-        {makeShared<SdStdLight>(), &SdStdLight::RttiClassType::getInstance(), {light, object}},
-        {makeShared<AreaLight>(), &AreaLight::RttiClassType::getInstance(), {light, object}},
-        {makeShared<SdCamera>(), &SdCamera::RttiClassType::getInstance(), {object}},
-        {makeShared<SdMeshGeometry>(), &SdMeshGeometry::RttiClassType::getInstance(), {geometry, object}},
-        {makeShared<SdTexture>(), &SdTexture::RttiClassType::getInstance(), {object}},
-        {SdMeshBuilder().build(), &SdMesh::RttiClassType::getInstance(), {object}},
-        {makeShared<SdMaterial>(), material, {}},
-        {makeShared<GlassMaterial>(), &GlassMaterial::RttiClassType::getInstance(), {material}},
-    };
-    for (const auto& c : cases) {
-        const RttiTypeBase& type = c.instance->getType();
-        std::vector<const RttiTypeBase*> ancestors;
-        for (ConstIterator<RttiTypeBase*> it = type.getAncestors(); !it.atEnd(); ++it) ancestors.push_back(*it);
-        EXPECT_EQ(&type, c.type) << type.getName();
-        EXPECT_EQ(ancestors, c.ancestors) << type.getName();
-    }
-    EXPECT_EQ(&RttiType<SdObject>::cast(cases[0].instance->getType()), cases[0].type);
-    EXPECT_THROW(RttiType<SdMaterial>::cast(cases[0].instance->getType()), ExCastFailed);
 }
 
 }  // namespace

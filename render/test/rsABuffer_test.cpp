@@ -1,8 +1,7 @@
 // The anti-aliased path: whole renders through RsRenderer against the per-sample reference of the
 // test support (every sample's fragments laid in depth or drawing order, then filtered), in both
 // modes and with every kernel; the lists of one pixel against a model, exact ties included; the
-// coverage masks on shared edges; a flat mesh over its own colour; and a picture drawn in many
-// regions against windows drawn in one.
+// coverage masks on shared edges; and a picture drawn in many regions against windows drawn in one.
 #include <gtest/gtest.h>
 
 #include <bit>
@@ -245,31 +244,6 @@ TEST(RsABuffer, SharedEdgesGiveDisjointCompleteMasks) {
             }
         EXPECT_EQ(material._calls, fragments);
     }
-}
-
-// A closed opaque mesh of one colour over a fill of that colour is flat with every kernel in both
-// modes: the weights of every kernel sum to one, wherever a pixel's samples come from.
-TEST(RsABuffer, ClosedMeshOverItsOwnColourIsFlatWithEveryKernel) {
-    std::mt19937 rng(13);
-    const int w = 16, h = 16;
-    const Rgba colour(0.8f, 0.3f, 0.55f, 1.0f);
-    const GridMesh grid = jitteredGrid(rng, 6, -4, w + 4, -4, h + 4);
-    std::vector<GePoint3<float>> corners;
-    for (const Pt& p : grid.corners) corners.emplace_back(float(toPixels(p.x) - w / 2), float(toPixels(p.y) - h / 2), -1.0f);
-    const RCShdPtr<RsScene> scene = makeScene({drawn(makeMesh(corners, grid.triangles), colour)});
-    for (int type = 0; type < RsFilterKernel::nbKernelTypes; ++type)
-        for (const bool zBuffer : {true, false}) {
-            RsRenderer renderer;
-            renderer.setAntialiasing(true);
-            renderer.setZBuffer(zBuffer);
-            renderer.setFilterKernel(static_cast<RsFilterKernel::KernelType>(type));
-            renderer.setFillColor(colour);
-            Picture picture({0, w, 0, h});
-            renderer.render({}, pixelView(w, h), scene, {0, w, 0, h}, picture.guard);
-            for (int y = 0; y < h; ++y)
-                for (int x = 0; x < w; ++x)
-                    expectNearRgba(picture.at(x, y), colour, 1e-5, "kernel " + std::to_string(type));
-        }
 }
 
 // Overlapping transparent and opaque triangles seen in perspective, with a kernel of support 2 in

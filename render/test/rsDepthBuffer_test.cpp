@@ -1,6 +1,6 @@
 // The depth buffers through a light's depth pass: random triangles, some crossing the near and far
 // planes and the map's sides, against the eye z of a ray through each pixel centre (the nearest, or
-// the mean of the two nearest); the midpoint's own cases on one pixel; the factories' region checks.
+// the mean of the two nearest), and the midpoint's own cases on one pixel.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -9,11 +9,8 @@
 #include <string>
 #include <vector>
 
-#include "exBase.h"
-#include "rsMZBufferFactory.h"
 #include "rsShadowPass.h"
 #include "rsTestSupport.h"
-#include "rsZBufferFactory.h"
 
 namespace Zr {
 namespace {
@@ -121,33 +118,6 @@ TEST(RsDepthBuffers, TheMidpointKeepsTheTwoNearestSurfaces) {
     EXPECT_EQ(midpointOf({-3, -7, -5}), -4.0);   // a third between replaces the second
     EXPECT_EQ(midpointOf({-7, -5, -3}), -4.0);
     EXPECT_EQ(midpointOf({-3, -3, -5}), -3.0);   // a surface level with the nearest is the second
-}
-
-// A region must be the whole map; its sides are tested in the order x start, y start, x end,
-// y end, each failing with its own text.
-TEST(RsDepthBuffers, FactoriesRefuseAnyRegionButTheWholeMap) {
-    std::vector<double> map(12);
-    RsZBufferFactory z;
-    RsMZBufferFactory mz;
-    z.setOutput(4, 3, map.data());
-    mz.setOutput(4, 3, map.data());
-    const struct { GeRectangle<int> region; const char* text; } rows[] = {
-        {{1, 3, 1, 2}, "region.x1() == 0"},     {{0, 3, 1, 2}, "region.y1() == 0"},
-        {{0, 3, 0, 2}, "region.x2() == _width"}, {{0, 4, 0, 2}, "region.y2() == _height"}};
-    for (const auto& row : rows) {
-        for (const bool midpoint : {false, true}) {
-            try {
-                if (midpoint) delete mz.createBuffer(row.region);
-                else delete z.createBuffer(row.region);
-                ADD_FAILURE() << row.text;
-            } catch (const ExAssertionFailed& e) {
-                EXPECT_EQ(e.getMessage(), row.text);
-                EXPECT_EQ(e.getFile(), midpoint ? "render\\suave\\src\\rsMZBufferFactory"
-                                                 : "render\\suave\\src\\rsZBufferFactory");
-            }
-        }
-    }
-    EXPECT_EQ(RCShdPtr<RsZBuffer>(z.createBuffer({0, 4, 0, 3}))->getPixelRegion(), GeRectangle<int>(0, 4, 0, 3));
 }
 
 }  // namespace

@@ -1,6 +1,5 @@
 // The fragment Z-buffer: per-pixel lists in both modes against a model that states what a list
-// must hold without building it; the pool's growth in its memory account; and what a factory hands
-// the buffers it makes.
+// must hold without building it, and what a factory hands the buffers it makes.
 //
 // Hand-made spans tell the material which fragment it shades through the eye position, which runs
 // (x, id, 0) along the span (x the region-relative pixel, id the span's number); the depth starts
@@ -146,25 +145,6 @@ TEST(RsFZBuffer, ListsMatchTheModelInBothModes) {
                     }
             }
         }
-}
-
-// The memory account is the object, its pool, one chunk of one fragment per pixel and the
-// per-pixel arrays; more fragments than pixels take whole chunks more.
-TEST(RsFZBuffer, MemoryAccountGrowsByWholeChunks) {
-    for (bool zBuffer : {false, true}) {
-        TestMaterial material(MaterialSettings(Rgba(1, 1, 1, 0.5f)));
-        RsFZBuffer buffer(-40, 17, 5, 2, zBuffer, true);
-        const std::size_t perPixel = sizeof(RsFragment) + sizeof(RsFragment*) + (zBuffer ? sizeof(double) : 1);
-        EXPECT_EQ(buffer.getMemorySize(), sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel);
-        for (int layer = 0; layer < 3; ++layer)
-            for (int row = 0; row < 2; ++row)
-                feedSpan(buffer, makeContext(material, RsTransferFunc::getFunction(Mode::normal), true), row, 0, 5,
-                         layer, 0.5 - 0.1 * layer, 0.0);
-        EXPECT_EQ(material._calls, 30);
-        EXPECT_EQ(buffer.getPool().getChunkCount(), 3u);
-        EXPECT_EQ(buffer.getMemorySize(),
-                  sizeof(RsFZBuffer) + sizeof(RsFragmentPool) + 10 * perPixel + 20 * sizeof(RsFragment));
-    }
 }
 
 // A factory's buffers cover the region asked for in the factory's depth mode, and resolve with

@@ -1,15 +1,12 @@
 // The renderer's entry points, seen through the pixels of a float output tile: layers composited in
 // depth order with and without the Z-buffer against the reference composite, lights prepared on
-// every call, the camera overload and the entry's failures, a cancel from another thread, and
-// hostile scenes.
+// every call, the camera overload and the entry's failures, and hostile scenes.
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <future>
 #include <limits>
 #include <random>
 #include <string>
-#include <thread>
 #include <utility>
 
 #include "exBase.h"
@@ -151,45 +148,6 @@ TEST(RsRenderer, CameraInstancesAndFailures) {
     renderer.render(makeShared<SdInstance>(makeShared<SdMeshGeometry>(), place), scene, rect, notDrawn.guard);
     EXPECT_THROW(renderer.render(RCShdPtr<SdInstance>(), scene, rect, notDrawn.guard), ExNullPtr);
     EXPECT_TRUE(notDrawn == Picture(rect, untouched));
-}
-
-// A cancel requested from another thread while a render runs ends the render with the cancel
-// exception. The render's first interrupt check lets the other thread make its request and waits
-// for it; the next check must see it.
-TEST(RsRenderer, CancelFromAnotherThreadEndsTheRender) {
-    struct Rendezvous : PxInterruptHandler {
-        void onInterruptCheck() override {
-            if (std::exchange(checked, true)) return;
-            started.set_value();
-            requestMade.wait();
-        }
-        bool checked = false;  // touched by the rendering thread only
-        std::promise<void> started, requested;
-        std::future<void> requestMade = requested.get_future();
-    };
-    const RCShdPtr<Rendezvous> rendezvous = makeShared<Rendezvous>();
-    const InterruptHandlerScope scope(rendezvous);
-    std::thread canceller([&, started = rendezvous->started.get_future()] {
-        started.wait();
-        PxRequestMgr::getInstance()->requestCancel();
-        rendezvous->requested.set_value();
-    });
-    const GeRectangle<int> rect{0, 48, 0, 48};
-    std::string outcome = "finished";
-    try {
-        Picture picture(rect);
-        RsRenderer().render({}, parallel(48, 48, 0.5, 20.0), makeScene({drawn(quad(48, 48, 0, 48, 0, 48, -2.0f), {})}),
-                            rect, picture.guard);
-    } catch (const ExRenderCancelled&) {
-        outcome = "cancelled";
-    } catch (...) {
-        outcome = "failed otherwise";
-    }
-    if (!rendezvous->checked) rendezvous->started.set_value();  // no check at all: let the thread go
-    canceller.join();
-    PxRequestMgr::getInstance()->clearCancel();
-    EXPECT_TRUE(rendezvous->checked) << "the render made no interrupt check";
-    EXPECT_EQ(outcome, "cancelled");
 }
 
 // Random scenes from a fixed seed with coordinates and matrix entries that are not numbers,

@@ -276,40 +276,5 @@ TEST(RsSceneRenderer, WireRingsCoverABandAlongTheEdges) {
     EXPECT_GT(banded, 1000);
 }
 
-// Overlapping triangles of every drawing path, some transparent: any window of the picture drawn
-// as one region of its own equals that part of the picture drawn whole in many regions.
-TEST(RsSceneRenderer, PictureInManyRegionsEqualsEachWindowInOne) {
-    std::mt19937 rng(47);
-    std::uniform_real_distribution<float> xy(-3.0f, 3.0f), depth(-8.0f, 0.3f), unit(0.0f, 1.0f);
-    const Rect rect{-37, 420, 11, 300};  // 132073 pixels: sixteen regions
-    for (int trial = 0; trial < 3; ++trial) {
-        std::vector<RCShdPtr<RsGeomInstance>> instances;
-        for (int i = 0; i < 16; ++i) {
-            std::vector<GePoint3<float>> corners;
-            for (int k = 0; k < 3; ++k) corners.emplace_back(xy(rng), xy(rng), depth(rng));
-            MaterialSettings settings;
-            settings.colour = {unit(rng), unit(rng), unit(rng), i % 2 ? 1.0f : unit(rng)};
-            settings.needed = (i % 3 == 0) ? 0x01u : (i % 3 == 1 ? 0x3eu : 0x7fu);
-            settings.wireframe = i % 4 == 3;
-            settings.screenSpace = i % 8 == 3;
-            settings.wireSize = settings.screenSpace ? 3.0f : 0.2f;
-            instances.push_back(drawn(makeMesh(corners, {0, 1, 2}, corners), settings));
-        }
-        const RCShdPtr<RsScene> scene = makeScene(instances);
-        Picture whole(rect);
-        render(scene, kProjection, rect, whole);
-        for (int w = 0; w < 4; ++w) {
-            const int x0 = rect.x0 + int(rng() % (rect.getWidth() - 128)),
-                      y0 = rect.y0 + int(rng() % (rect.getHeight() - 128));
-            Picture window({x0, x0 + 128, y0, y0 + 128});
-            render(scene, kProjection, rect, window);
-            for (int y = y0; y < y0 + 128; ++y)
-                ASSERT_EQ(
-                    std::memcmp(window.guard.getPixelAddress(x0, y), whole.guard.getPixelAddress(x0, y), 16 * 128), 0)
-                    << "row " << y << " of window at " << x0 << ", " << y0;
-        }
-    }
-}
-
 }  // namespace
 }  // namespace Zr

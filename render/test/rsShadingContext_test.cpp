@@ -1,4 +1,4 @@
-// The shading context: its starting state, the normalisation rule, the view vector against its
+// The shading context: the normalisation rule, the view vector against its
 // closed form, and bump mapping against a double-precision reference in randomly turned tangent
 // frames and at its degenerate cases.
 #include <gtest/gtest.h>
@@ -25,15 +25,6 @@ void expectNear(const GeVector3<float>& got, const V& want, double tolerance, co
     EXPECT_NEAR(got.x, want.x, tolerance) << what;
     EXPECT_NEAR(got.y, want.y, tolerance) << what;
     EXPECT_NEAR(got.z, want.z, tolerance) << what;
-}
-
-// A new context looks down negative z, perspective, without ambient light or shadows received.
-TEST(RsShadingContext, StartsLookingDownNegativeZ) {
-    const RsShadingContext context;
-    EXPECT_FALSE(context._receivesShadows || context._orthographic);
-    EXPECT_EQ(context._viewDirection, GeVector3<float>(0.0f, 0.0f, -1.0f));
-    EXPECT_EQ(context._ambient, CoRgbColorTyped<float>(0.0f, 0.0f, 0.0f));
-    EXPECT_FLOAT_EQ(context._normal.length(), 1.0f);
 }
 
 // Directions over thirty orders of magnitude come out as their unit vector; zero, and vectors so
