@@ -18,20 +18,27 @@ using namespace Zr;
 constexpr int kWidth = 960;
 constexpr int kHeight = 540;
 
-IxPixelFormat formatOf(const benchmark::State& state) {
-    return IxPixelFormat(IxPixelFormat::RGBA, static_cast<IxPixelFormat::Depth>(state.range(0)));
-}
-
-// Argument: output depth in bits.
-void BM_SingleRender(benchmark::State& state) {
+// The still sample scene, its camera and an output tile of the depth in bits of the benchmark's
+// first argument.
+struct Frame {
+    explicit Frame(const benchmark::State& state)
+        : tile(IxPixelFormat(IxPixelFormat::RGBA, static_cast<IxPixelFormat::Depth>(state.range(0))), rect, {}),
+          output(tile) {}
     const RCShdPtr<RsScene> scene = ZrSampleScene::makeScene();
     const RCShdPtr<SdInstance> camera = ZrSampleScene::makeCamera(kWidth, kHeight);
     const GeRectangle<int> rect{0, kWidth, 0, kHeight};
-    IxTile tile(formatOf(state), rect, {});
-    const IxWriteGuard output(tile);
+    IxTile tile;
+    const IxWriteGuard output;
+};
+
+constexpr CoRgbaColorTyped<float> kFill(0.16f, 0.18f, 0.23f, 1.0f);
+
+// Argument: output depth in bits.
+void BM_SingleRender(benchmark::State& state) {
+    const Frame frame(state);
     RsRenderer renderer;
-    renderer.setFillColor({0.16f, 0.18f, 0.23f, 1.0f});
-    for (auto _ : state) renderer.render(camera, scene, rect, output);
+    renderer.setFillColor(kFill);
+    for (auto _ : state) renderer.render(frame.camera, frame.scene, frame.rect, frame.output);
     state.counters["pass_ms"] = benchmark::Counter(1e-3, benchmark::Counter::kIsIterationInvariantRate |
                                                              benchmark::Counter::kInvert);
 }
@@ -39,21 +46,17 @@ BENCHMARK(BM_SingleRender)->ArgNames({"bits"})->Arg(8)->Arg(32)->Unit(benchmark:
 
 // Arguments: output depth in bits, passes.
 void BM_AccumulatedFrame(benchmark::State& state) {
-    const RCShdPtr<RsScene> scene = ZrSampleScene::makeScene();
-    const RCShdPtr<SdInstance> camera = ZrSampleScene::makeCamera(kWidth, kHeight);
-    const GeRectangle<int> rect{0, kWidth, 0, kHeight};
-    IxTile tile(formatOf(state), rect, {});
-    const IxWriteGuard output(tile);
+    const Frame frame(state);
     RsAccumulationRenderer renderer;
-    renderer.setFillColor({0.16f, 0.18f, 0.23f, 1.0f});
+    renderer.setFillColor(kFill);
     renderer.setMotionBlurEnabled(true);
     const auto passes = static_cast<unsigned int>(state.range(1));
     renderer.setNbSamples(passes);
     for (auto _ : state) {
-        renderer.beginFrame(rect, output);
+        renderer.beginFrame(frame.rect, frame.output);
         do {
             benchmark::DoNotOptimize(renderer.getSampleOffsetTime(Rational(24, 1)));
-            renderer.renderFrame(camera, scene);
+            renderer.renderFrame(frame.camera, frame.scene);
         } while (renderer.nextFrame());
     }
     state.counters["pass_ms"] = benchmark::Counter(1e-3 * passes, benchmark::Counter::kIsIterationInvariantRate |

@@ -93,6 +93,16 @@ void RsAuxOutputs::beginMotion(const RsScene& scene, const GeRectangle<int>& rec
     }
 }
 
+void RsAuxOutputs::recordMotion(std::size_t index, const GePoint3<float>& world, double pixelX, double pixelY) {
+    const std::size_t object = std::size_t(_objectId[index]) - 1;
+    if (object >= _toLaterPixels.size()) return;
+    const GeHomogeneousCoord3<double> later =
+        _toLaterPixels[object].transform(GePoint3<double>(world.x, world.y, world.z));
+    if (!(later.w > 0.0)) return;
+    _motion[2 * index] = static_cast<float>(later.x / later.w - pixelX);
+    _motion[2 * index + 1] = static_cast<float>(later.y / later.w - pixelY);
+}
+
 float RsAuxOutputs::eyeDepthOf(double pixelDepth) const {
     // Undo the viewport (0..1 from -1..1) and the projection's z and w rows.
     const double d = 2.0 * pixelDepth - 1.0;
@@ -105,7 +115,8 @@ void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
     if (_surface) {
         for (int row = 0; row < height; ++row) {
             const std::size_t first = indexOf(buffer.getX(), buffer.getY() + row);
-            for (std::size_t i = first; i < first + std::size_t(width); ++i) {
+            for (int x = 0; x < width; ++x) {
+                const std::size_t i = first + std::size_t(x);
                 if (_nearest[i] == kNone) continue;
                 float* p = &_position[3 * i];
                 float* n = &_normal[3 * i];
@@ -121,24 +132,7 @@ void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
                 n[0] = m.x * scale;
                 n[1] = m.y * scale;
                 n[2] = m.z * scale;
-            }
-        }
-    }
-    if (_hasTarget) {
-        // From the world positions made above and the object IDs.
-        for (int row = 0; row < height; ++row) {
-            const std::size_t first = indexOf(buffer.getX(), buffer.getY() + row);
-            for (int x = 0; x < width; ++x) {
-                const std::size_t i = first + std::size_t(x);
-                if (_nearest[i] == kNone) continue;
-                const std::size_t object = std::size_t(_objectId[i]) - 1;
-                if (object >= _toLaterPixels.size()) continue;
-                const float* p = &_position[3 * i];
-                const GeHomogeneousCoord3<double> later =
-                    _toLaterPixels[object].transform(GePoint3<double>(p[0], p[1], p[2]));
-                if (!(later.w > 0.0)) continue;
-                _motion[2 * i] = static_cast<float>(later.x / later.w - (buffer.getX() + x + 0.5));
-                _motion[2 * i + 1] = static_cast<float>(later.y / later.w - (buffer.getY() + row + 0.5));
+                if (_hasTarget) recordMotion(i, world, buffer.getX() + x + 0.5, buffer.getY() + row + 0.5);
             }
         }
     }
@@ -149,29 +143,27 @@ void RsAuxOutputs::finishRegion(const RsFZBuffer& buffer) {
         };
         std::sort(_fragmentIds.begin(), _fragmentIds.end(), before);
         RsFragment* const* lists = buffer.getLists();
-        std::vector<const RsFragment*> nearFirst;
         for (int row = 0; row < height; ++row) {
             const std::size_t first = indexOf(buffer.getX(), buffer.getY() + row);
             for (int x = 0; x < width; ++x) {
-                nearFirst.clear();
-                for (const RsFragment* f = lists[std::size_t(row) * std::size_t(width) + std::size_t(x)]; f != nullptr;
-                     f = f->_next)
-                    nearFirst.push_back(f);
                 const std::size_t i = first + std::size_t(x);
-                _deepOffsets[i] = static_cast<std::uint32_t>(_deepSamples.size());
-                _deepCounts[i] = static_cast<std::uint32_t>(nearFirst.size());
-                for (auto f = nearFirst.rbegin(); f != nearFirst.rend(); ++f) {
+                const std::size_t offset = _deepSamples.size();
+                for (const RsFragment* f = lists[std::size_t(row) * std::size_t(width) + std::size_t(x)]; f != nullptr;
+                     f = f->_next) {
                     // What the fragment lays over nothing is its share of the pixel.
-                    const RsFragment& fragment = **f;
                     CoRgbaColorTyped<float> alone(0.0f, 0.0f, 0.0f, 1.0f);
-                    fragment._transfer(fragment._color, CoRgbaColorTyped<float>(0.0f, 0.0f, 0.0f, 0.0f), alone);
-                    const float z = eyeDepthOf(fragment._depth);
-                    const auto ids = std::lower_bound(_fragmentIds.begin(), _fragmentIds.end(),
-                                                      FragmentIds{&fragment, 0.0f, 0.0f}, before);
-                    const bool known = ids != _fragmentIds.end() && ids->fragment == &fragment;
+                    f->_transfer(f->_color, CoRgbaColorTyped<float>(0.0f, 0.0f, 0.0f, 0.0f), alone);
+                    const float z = eyeDepthOf(f->_depth);
+                    const auto ids =
+                        std::lower_bound(_fragmentIds.begin(), _fragmentIds.end(), FragmentIds{f, 0.0f, 0.0f}, before);
+                    const bool known = ids != _fragmentIds.end() && ids->fragment == f;
                     _deepSamples.push_back({z, z, alone.r, alone.g, alone.b, alone.a, known ? ids->objectId : 0.0f,
                                             known ? ids->materialId : 0.0f});
                 }
+                // The list runs from far to near; the samples run nearest first.
+                std::reverse(_deepSamples.begin() + std::ptrdiff_t(offset), _deepSamples.end());
+                _deepOffsets[i] = static_cast<std::uint32_t>(offset);
+                _deepCounts[i] = static_cast<std::uint32_t>(_deepSamples.size() - offset);
             }
         }
         _fragmentIds.clear();

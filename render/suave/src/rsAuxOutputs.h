@@ -159,6 +159,9 @@ private:
     static constexpr double kNone = std::numeric_limits<double>::max();
     // The eye depth (positive in front) of a pixel depth.
     float eyeDepthOf(double pixelDepth) const;
+    // The motion of pixel index, whose front-most surface point lies at world and is seen at the
+    // pixel centre (pixelX, pixelY): where the point lands later minus the centre.
+    void recordMotion(std::size_t index, const GePoint3<float>& world, double pixelX, double pixelY);
 
     GeRectangle<int> _region;
     bool _surface;
