@@ -67,7 +67,7 @@ std::vector<std::string> ZrCryptomatte::channelNames() const {
     return names;
 }
 
-void ZrCryptomatte::describe(OIIO::ImageSpec& spec) const {
+void ZrCryptomatte::describe(OIIO::ImageSpec& header) const {
     // Names in order, each once, whatever the IDs that share it.
     std::map<std::string, float> entries;
     for (std::size_t id = 1; id < _names.size(); ++id) entries.emplace(_names[id], _ids[id]);
@@ -78,10 +78,10 @@ void ZrCryptomatte::describe(OIIO::ImageSpec& spec) const {
     }
     manifest += '}';
     const std::string prefix = "cryptomatte/" + hex8(hashOf(_layer)).substr(0, 7) + "/";
-    spec.attribute(prefix + "name", _layer);
-    spec.attribute(prefix + "hash", "MurmurHash3_32");
-    spec.attribute(prefix + "conversion", "uint32_to_float32");
-    spec.attribute(prefix + "manifest", manifest);
+    header.attribute(prefix + "name", _layer);
+    header.attribute(prefix + "hash", "MurmurHash3_32");
+    header.attribute(prefix + "conversion", "uint32_to_float32");
+    header.attribute(prefix + "manifest", manifest);
 }
 
 void ZrCryptomatte::pixel(const RsDeepSample* samples, std::size_t count, float* values) {

@@ -3,8 +3,8 @@
 // coverage, in the open layout of three RGBA layers per matte type.
 //
 //   ZrCryptomatte objects("CryptoObject", "object", outputs.getObjectNames(), &RsDeepSample::_objectId);
-//   spec.channelnames += objects.channelNames();   // CryptoObject00.R ... CryptoObject02.A
-//   objects.describe(spec);                         // the cryptomatte/<key>/... attributes
+//   header.channelnames += objects.channelNames();   // CryptoObject00.R ... CryptoObject02.A
+//   objects.describe(header);                         // the cryptomatte/<key>/... attributes
 //   objects.pixel(samples, count, values);          // 12 floats per pixel from its deep samples
 //
 // Layer k holds ranks 2k and 2k + 1 as (id, coverage, id, coverage), ranks ordered by decreasing
@@ -45,7 +45,7 @@ public:
     std::vector<std::string> channelNames() const;
     // Adds the attributes cryptomatte/<key>/name, hash, conversion and manifest, where key is
     // the first 7 hex digits of the layer name's hash.
-    void describe(OIIO::ImageSpec& spec) const;
+    void describe(OIIO::ImageSpec& header) const;
     // The kChannels values of a pixel from its deep samples, nearest first.
     void pixel(const RsDeepSample* samples, std::size_t count, float* values);
 

@@ -37,10 +37,10 @@ OIIO::ImageSpec unassociatedConfig() {
 
 RCShdPtr<SdTexture> readTextureFrom(std::unique_ptr<OIIO::ImageInput> input, const std::string& name) {
     if (!input) throw ZrHostError(name + ": " + lastError("cannot read the image"));
-    const OIIO::ImageSpec& spec = input->spec();
-    const int width = spec.width;
-    const int height = spec.height;
-    const int channels = spec.nchannels;
+    const OIIO::ImageSpec& header = input->spec();
+    const int width = header.width;
+    const int height = header.height;
+    const int channels = header.nchannels;
     if (width <= 0 || height <= 0 || channels <= 0 || static_cast<long long>(width) * height > (1LL << 28))
         throw ZrHostError(name + ": an image of " + std::to_string(width) + "x" + std::to_string(height) +
                           " pixels cannot be a texture");
@@ -86,19 +86,19 @@ void ZrImageFile::write(const std::string& path, const OIIO::ImageBuf& picture, 
                                                               : OIIO::TypeDesc::UINT8;
     const bool keepAlpha = output->supports("alpha");
     OIIO::ImageBuf pixels = keepAlpha ? picture : OIIO::ImageBufAlgo::channels(picture, 3, {});
-    OIIO::ImageSpec spec(picture.spec().width, picture.spec().height, keepAlpha ? 4 : 3, type);
-    if (keepAlpha) spec.alpha_channel = 3;
-    if (storage == Storage::uint8) spec.attribute("oiio:UnassociatedAlpha", 1);
-    spec.attribute("Software", "zrender");
+    OIIO::ImageSpec header(picture.spec().width, picture.spec().height, keepAlpha ? 4 : 3, type);
+    if (keepAlpha) header.alpha_channel = 3;
+    if (storage == Storage::uint8) header.attribute("oiio:UnassociatedAlpha", 1);
+    header.attribute("Software", "zrender");
 
     // The pixels go to a file beside the output first, which then takes its place: a failed or
     // interrupted write leaves no half-written picture.
     const std::filesystem::path target(path);
     const std::filesystem::path partial =
         target.parent_path() / (target.stem().string() + ".partial" + target.extension().string());
-    std::vector<float> values(static_cast<std::size_t>(spec.width) * spec.height * spec.nchannels);
+    std::vector<float> values(static_cast<std::size_t>(header.width) * header.height * header.nchannels);
     bool written = pixels.get_pixels(pixels.roi(), OIIO::TypeDesc::FLOAT, values.data());
-    written = written && output->open(partial.string(), spec);
+    written = written && output->open(partial.string(), header);
     written = written && output->write_image(OIIO::TypeDesc::FLOAT, values.data());
     const std::string error = output->geterror();
     written = output->close() && written;

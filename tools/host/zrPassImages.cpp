@@ -87,12 +87,12 @@ OIIO::ImageBuf ZrPassImages::layers(const OIIO::ImageBuf& picture) const {
     }
     const int firstMatte = static_cast<int>(names.size()) - static_cast<int>(mattes.size()) * ZrCryptomatte::kChannels;
     const int channels = static_cast<int>(names.size());
-    OIIO::ImageSpec spec(_width, _height, channels, OIIO::TypeDesc::FLOAT);
-    spec.channelnames = names;
-    spec.alpha_channel = 3;
-    spec.z_channel = (_passes & depth) != 0 ? 4 : -1;
-    for (const ZrCryptomatte& matte : mattes) matte.describe(spec);
-    OIIO::ImageBuf image(spec);
+    OIIO::ImageSpec header(_width, _height, channels, OIIO::TypeDesc::FLOAT);
+    header.channelnames = names;
+    header.alpha_channel = 3;
+    header.z_channel = (_passes & depth) != 0 ? 4 : -1;
+    for (const ZrCryptomatte& matte : mattes) matte.describe(header);
+    OIIO::ImageBuf image(header);
     OIIO::ImageBufAlgo::paste(image, 0, 0, 0, 0, picture);
     std::vector<float> row;
     for (const std::unique_ptr<RsAuxOutputs>& tile : _tiles) {
@@ -129,12 +129,12 @@ OIIO::ImageBuf ZrPassImages::layers(const OIIO::ImageBuf& picture) const {
 }
 
 OIIO::ImageBuf ZrPassImages::deepImage() const {
-    OIIO::ImageSpec spec(_width, _height, 8, OIIO::TypeDesc::FLOAT);
-    spec.channelnames = {"R", "G", "B", "A", "Z", "ZBack", "ObjectID", "MaterialID"};
-    spec.alpha_channel = 3;
-    spec.z_channel = 4;
-    spec.deep = true;
-    OIIO::ImageBuf image(spec);
+    OIIO::ImageSpec header(_width, _height, 8, OIIO::TypeDesc::FLOAT);
+    header.channelnames = {"R", "G", "B", "A", "Z", "ZBack", "ObjectID", "MaterialID"};
+    header.alpha_channel = 3;
+    header.z_channel = 4;
+    header.deep = true;
+    OIIO::ImageBuf image(header);
     OIIO::DeepData& deep = *image.deepdata();
     const auto pixelOf = [this](int x, int y) { return std::int64_t(_height - 1 - y) * _width + x; };
     std::vector<unsigned int> counts(std::size_t(_width) * std::size_t(_height), 0);
