@@ -136,12 +136,9 @@ TEST(RsAuxOutputs, LayeredScenesGiveFrontMostLayerAndDeepListsThatFlattenToThePi
         std::vector<RCShdPtr<RsGeomInstance>> instances{makeInstance(
             makeMesh({{-1e3f, 0, -2}, {-999, 0, -2}, {-999, 1, -2}}, {0, 1, 2}), {}, {},
             {makeShared<TestMaterial>(), makeShared<TestMaterial>()})};
-        std::vector<float> depths;
-        for (int i = 0; i < 7; ++i) depths.push_back(-1.0f - 0.75f * i);
-        std::shuffle(depths.begin(), depths.end(), rng);
-        for (float z : depths) {
-            const int x0 = int(rng() % w), x1 = x0 + 1 + int(rng() % (w - x0));
-            const int y0 = int(rng() % h), y1 = y0 + 1 + int(rng() % (h - y0));
+        for (const LayerRect& rect : randomLayerRects(rng, 7, 0.75f, w, h)) {
+            const auto [x0, x1, y0, y1] = rect.pixels;
+            const float z = rect.z;
             // Opaque layers of alpha 1 and of alpha one ulp below, which counts as one.
             const float alpha = rng() % 3 == 0 ? (rng() % 2 ? 1.0f : 0.99999994f) : 0.1f + 0.8f * unit(rng);
             layers.push_back({{x0, x1, y0, y1}, -z, Rgba(unit(rng), unit(rng), unit(rng), alpha),

@@ -48,12 +48,9 @@ TEST(RsRenderer, LayersCompositeInDepthOrderWithAndWithoutZBuffer) {
         };
         std::vector<Layer> layers;
         std::vector<RCShdPtr<RsGeomInstance>> instances;
-        std::vector<float> depths;
-        for (int i = 0; i < 8; ++i) depths.push_back(-1.0f - 0.5f * i);
-        std::shuffle(depths.begin(), depths.end(), rng);
-        for (float z : depths) {
-            const int x0 = int(rng() % w), x1 = x0 + 1 + int(rng() % (w - x0));
-            const int y0 = int(rng() % h), y1 = y0 + 1 + int(rng() % (h - y0));
+        for (const LayerRect& rect : randomLayerRects(rng, 8, 0.5f, w, h)) {
+            const auto [x0, x1, y0, y1] = rect.pixels;
+            const float z = rect.z;
             const float alpha = rng() % 2 ? 1.0f : 0.1f + 0.8f * unit(rng);
             const Layer layer{{x0, x1, y0, y1}, z, Rgba(unit(rng), unit(rng), unit(rng), alpha)};
             const bool front = rng() % 2;

@@ -755,6 +755,25 @@ inline GePoint2<double> pixelOfPoint(const GeProjectiveMatrix3<double>& projecti
             rectangle.y0 + sy * (1 + projection(1, 1) * p.y / -p.z)};
 }
 
+// count rectangles of pixels of a w x h view, each drawn at random, at the distinct depths -1,
+// -1 - step, -1 - 2 step, ... in random order.
+struct LayerRect {
+    GeRectangle<int> pixels;
+    float z;
+};
+inline std::vector<LayerRect> randomLayerRects(std::mt19937& rng, int count, float step, int w, int h) {
+    std::vector<float> depths;
+    for (int i = 0; i < count; ++i) depths.push_back(-1.0f - step * float(i));
+    std::shuffle(depths.begin(), depths.end(), rng);
+    std::vector<LayerRect> rects;
+    for (float z : depths) {
+        const int x0 = int(rng() % w), x1 = x0 + 1 + int(rng() % (w - x0));
+        const int y0 = int(rng() % h), y1 = y0 + 1 + int(rng() % (h - y0));
+        rects.push_back({{x0, x1, y0, y1}, z});
+    }
+    return rects;
+}
+
 // Deep samples (nearest first, premultiplied) laid front to back with "over".
 inline Rgba flattenFrontToBack(const float* samples, std::size_t count, std::size_t stride) {
     double r = 0, g = 0, b = 0, a = 0;
